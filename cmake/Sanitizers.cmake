@@ -1,0 +1,15 @@
+# ostracrv_apply_sanitizer(target): adds the flags of OSTRACRV_SANITIZER to a
+# target, publicly, so that everything linking the library is instrumented too.
+function(ostracrv_apply_sanitizer target)
+  if(OSTRACRV_SANITIZER STREQUAL "asan-ubsan")
+    set(_f -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  elseif(OSTRACRV_SANITIZER STREQUAL "tsan")
+    set(_f -fsanitize=thread -fno-omit-frame-pointer)
+  elseif(OSTRACRV_SANITIZER STREQUAL "")
+    return()
+  else()
+    message(FATAL_ERROR "OSTRACRV_SANITIZER must be empty, asan-ubsan or tsan")
+  endif()
+  target_compile_options(${target} PUBLIC ${_f})
+  target_link_options(${target} PUBLIC ${_f})
+endfunction()

@@ -93,70 +93,165 @@ int crvProblem();
 
 namespace OstraCrv {
 
-// Checks the rules of a valid path; stops at the first fault.
+// Bad input in general: a null array with a count above zero, a negative count
+// or an index outside 0..n-1 never reads or writes outside the array; each
+// function below says what it answers then.
+
+// Checks the rules of a valid path and stops at the first fault: node 0 is a
+// move; no move or line follows an arc; a curve at i has arcs at i-1 and i-2
+// and a non-arc at i-3; an arc is not the last node, has no closed or
+// continuity bits, and has the user bit only while enabled; the last node of a
+// subpath that ends in a segment has the closed bit of the subpath's first
+// node, and a closed subpath does not have the user bit on both ends. An empty
+// array (even a null one) is valid, a lone move is valid. Returns false for a
+// null array with n > 0 and for n > INT_MAX (a negative count cast to
+// unsigned). O(n).
 bool IsValidCurve(NODETYPE const* nodes, unsigned long n);
-// Repairs the flags (user, closed, a trailing arc); returns whether any byte
-// changed. Kinds of nodes are otherwise left alone.
+// Repairs the flags: every move gets the user bit; the last node of each
+// subpath becomes a line if it was an arc, takes the closed bit of the
+// subpath's first node, and has the user bit exactly when open; interior nodes
+// lose the closed bit and non-arcs among them get the user bit. Moves' closed
+// bits, enabled, letter and continuity bits and an invalid order of kinds are
+// left alone. Returns whether any byte changed; false and no write for a null
+// array, n == 0 or n > INT_MAX. Idempotent. O(n).
 bool FixNodeTypes(NODETYPE* nodes, unsigned long n);
 
-// Segment numbering: each line and curve node ends one segment, counted from
-// 0 in array order. -1 where there is no such segment.
+// Segment numbering: each line and curve node ends one segment, numbered from
+// 0 in array order across all subpaths. Every conversion counts, O(n).
+//
+// The number of line and curve nodes; 0 for a null array or n < 1.
 int GetSegmentCount(NODETYPE const* nodes, int n);
+// The number of the segment that starts at the non-arc node i: it ends at i+1
+// when i+1 is a line and at i+3 otherwise (the kind at the end is not
+// checked). -1 when i+1 or that end lies outside 0..n-1, or nodes is null.
 int FirstNodeToSegmentIndex(NODETYPE const* nodes, int n, int i);
+// The number of the segment that ends at i; for a node that ends no segment,
+// the last segment before it, or -1 if there is none. -1 for i outside
+// 0..n-1 or a null array.
 int LastNodeToSegmentIndex(NODETYPE const* nodes, int n, int i);
+// The start node of segment s: the subpath's move for its first segment, else
+// the previous segment's end. -1 when there is no segment s (s < 0, s beyond
+// the count, n < 1, null array).
 int SegmentToFirstNodeIndex(NODETYPE const* nodes, int n, int s);
+// The line or curve node that ends segment s; -1 as for SegmentToFirstNodeIndex.
 int SegmentToLastNodeIndex(NODETYPE const* nodes, int n, int s);
 
-// Overlap-safe moves of array stretches; flags and lengths are the caller's.
+// Moves count entries of both arrays from index from to index to, overlap-safe.
+// Flags and the array length are the caller's. Nothing moves for null arrays,
+// negative indices or count <= 0. Explicitly instantiated for POINT and V.
 template <class T>
 void MovePath(T* points, NODETYPE* nodes, int to, int from, int count);
+// Copies count entries of both arrays of one path into another at index to
+// (overlap-safe, so source and destination may be the same path). Nothing is
+// copied for null arrays, negative indices or count <= 0.
 template <class T>
 void CopyPath(T* dstPoints, NODETYPE* dstNodes, int to, T const* srcPoints, NODETYPE const* srcNodes, int from,
               int count);
 
 }  // namespace OstraCrv
 
-// Walking with wrap-around at closed subpaths.
+// Walking with wrap-around at closed subpaths. Each answers i itself for a
+// null array or an i outside 0..n-1.
+//
+// The next node of the subpath: i+1 inside a subpath; at the last node i of an
+// open subpath; at the last node of a closed subpath its second node (the
+// first is the same place). A closed move that is its whole subpath answers
+// i+1, or i at the array end. O(1), O(subpath) at a wrap.
 int NN(NODETYPE const* nodes, int i, int n);
+// The previous node: i-1 inside a subpath; i at the first node of an open
+// subpath; the closing (last) node for both the first and the second node of
+// a closed subpath. O(1), O(subpath) at a wrap.
 int PN(NODETYPE const* nodes, int i, int n);
+// NN repeated until the node is not an arc: the next segment end (or move)
+// on the ring. Stops where NN stops moving. O(subpath).
 int NNControl(NODETYPE const* nodes, int i, int n);
+// PN repeated until the node is not an arc, stopping where PN stops moving.
 int PNControl(NODETYPE const* nodes, int i, int n);
+// The twin of a closed end: the last node for the first, the first node (or
+// the nearest lower closed node, stopping at 0) for any other closed node. A
+// lone closed move is its own twin. -1 for a node without the closed bit, an
+// index out of range, a null array, or a closed move whose subpath runs to the
+// array end without a closed node. O(subpath).
 int OtherClosedEnd(NODETYPE const* nodes, int i, int n);
 
-// Counting queries: single branch-free passes over the bytes.
+// Counting queries: single branch-free passes over the bytes, O(n), several
+// GB/s. Each gives 0 (false) for a null array or n < 1.
+//
+// Nodes of type line.
 int CRV_HowManyLines(NODETYPE const* nodes, int n);
+// Nodes of type curve (Bezier segments).
 int CRV_HowManyCurves(NODETYPE const* nodes, int n);
+// Moves without the closed bit.
 int CRV_HowManyOpenSubpaths(NODETYPE const* nodes, int n);
+// Moves: the number of subpaths, dangling moves included.
 int CRV_NumSubpaths(NODETYPE const* nodes, int n);
+// The node count of the subpath that starts at index first. subpathNodes is
+// that subpath's first node (&nodes[first]) while first and n are indices of
+// the whole array. At least 1 for a first in 0..n-1; 0 for a null pointer or
+// first outside 0..n-1. O(subpath).
 int CRV_CountNodesInSubpath(NODETYPE const* subpathNodes, int first, int n);
+// Non-arc nodes with the user bit; with enabledOnly, only the enabled ones.
+// n > INT_MAX (a negative count cast to unsigned) gives 0.
 int CRV_GetNumberOfUserNodes(NODETYPE const* nodes, unsigned n, bool enabledOnly);
+// Whether any node has the closed bit.
 bool CRV_ContainsClosedSubpath(NODETYPE const* nodes, int n);
+// Whether any move lacks the closed bit; with mustHaveSegment the move must
+// also be followed by a node of its own subpath (dangling moves do not count).
 bool CRV_ContainsOpenSubpath(NODETYPE const* nodes, int n, bool mustHaveSegment);
 
-// Subpath queries of one index.
+// Subpath queries of one index. The predicates are false, the index answers
+// -1, for a null array or an index outside 0..n-1.
+//
+// i is a move.
 bool CRV_IsFirstSubpathNode(NODETYPE const* nodes, int n, int i);
+// i is n-1 or i+1 is a move.
 bool CRV_IsLastSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsFirstOrLastSubpathNode(NODETYPE const* nodes, int n, int i);
+// As above, restricted to nodes without (Open) or with (Closed) the closed bit.
 bool CRV_IsFirstOpenSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsLastOpenSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsFirstOrLastOpenSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsFirstClosedSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsLastClosedSubpathNode(NODETYPE const* nodes, int n, int i);
 bool CRV_IsFirstOrLastClosedSubpathNode(NODETYPE const* nodes, int n, int i);
+// The nearest move at or before i; -1 if there is none.
 int CRV_FirstNodeOfThisSubpath(NODETYPE const* nodes, int n, int i);
+// The node before the next move after i, or n-1.
 int CRV_LastNodeOfThisSubpath(NODETYPE const* nodes, int n, int i);
+// The closed bit of the first node of i's subpath; false if it has none.
 bool CRV_IsThisSubpathClosed(NODETYPE const* nodes, int n, int i);
+// True for a == b; else true when no move lies in lower+1 .. higher. False
+// when either index is out of range.
 bool CRV_TwoNodesInSameSubpath(NODETYPE const* nodes, int n, int a, int b);
+// i if it has the user bit; for a closing node without it, its twin if that
+// has the user bit; else -1.
 int CRV_GetUserNode(NODETYPE const* nodes, int n, int i);
+// Whether node i can be made smooth: it joins two segments and at least one
+// is a Bezier (at a closed subpath's ends, the closing and the first segment
+// meet). Arcs and the ends of open subpaths never are.
 bool IsNodeSmoothable(NODETYPE const* nodes, int i, int n);
+// Whether node i can be made symmetric: both segments that meet there are
+// Beziers.
 bool IsNodeSymmetable(NODETYPE const* nodes, int i, int n);
 
-// Flag writers that keep the twins of a closed subpath in step.
+// Flag writers that keep the twins of a closed subpath in step. Each writes
+// node i and, if i has the closed bit, its twin (OtherClosedEnd). Nothing is
+// written for a null array or i outside 0..n-1.
+//
+// The low bit of on becomes the enabled bit.
 void CRV_SetEnabled(NODETYPE* nodes, int n, int i, int on);
+// The two low bits of c become the continuity field.
 void CRV_SetCont(NODETYPE* nodes, int n, int i, ContinuityType c);
 
-// Gap operations on both arrays; see MovePath.
+// Gap operations on both arrays of a path of n entries, overlap-safe; flags
+// and the length are the caller's. Explicitly instantiated for POINT and V.
+//
+// Closes a gap: the tail from i+count (n-(i+count) entries) moves down to i.
+// Nothing moves for null arrays, i < 0, count <= 0 or an empty tail.
 template <class T>
 void PathDelNext(NODETYPE* nodes, T* points, int i, int count, int n);
+// Opens a gap: the tail from i (n-i entries) moves up by count; the caller has
+// room for n+count entries, and the gap keeps whatever it held. Nothing moves
+// for null arrays, i < 0, count <= 0 or i >= n.
 template <class T>
 void PathInsNext(NODETYPE* nodes, T* points, int i, int count, int n);

@@ -3,8 +3,10 @@
 #pragma once
 
 #include "ostracrv/core/common_types.h"
+#include "ostracrv/core/curvedata.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
+#include "ostracrv/core/polycurve.h"
 #include "ostracrv/math/bezier_basis.h"
 #include "ostracrv/math/bezier_split.h"
 #include "ostracrv/math/matrix.h"

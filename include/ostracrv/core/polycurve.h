@@ -1,0 +1,286 @@
+// The path value type: a handle with copy-on-write storage.
+//
+// PolycurveT<T> holds one reference to a CurveDataBase<T> (see curvedata.h).
+// Copies share the storage; the first write through a handle whose storage is
+// shared or borrowed forks it, so other handles never see the write. Reads are
+// const and never fork. Indices are int, as in the flat interface; counts of
+// raw arrays are unsigned long, and a count with its top bit set (a negative
+// count cast to unsigned) is refused like a null array.
+//
+// Both point kinds have the same class: T = Framework::common_types::POINT
+// (integer) and T = MavikMath::V (double). Further methods of the class live
+// in other source files of the library, each explicitly instantiated there for
+// both kinds. Inside member bodies the members NodeTypes(), GetSegmentType()
+// and GetContinuity() hide the namespace NodeTypes and the free node readers
+// of the same names: write ::NodeTypes::Open::move, ::GetSegmentType(byte).
+//
+// Buffer protocol. Algorithms that edit raw arrays in place take mutable
+// arrays with GetBuffer(worst-case count), edit them with the flat functions
+// (which return the new node count) and give the final count back with
+// ReleaseBufferInternal. The pointers stay valid until the next non-const call
+// on the handle; since the arrays may be longer than the caller's count, code
+// between the two calls works from its own count.
+//
+// Failures: the handle throws nothing of its own. Exhausted memory and
+// oversized requests surface as std::bad_alloc or std::length_error and leave
+// the handle with its old storage. Methods with a bool result return false on
+// an index out of range, an empty curve or null arrays, as listed; accessors
+// that return references answer a static default on a bad index.
+#pragma once
+
+#include <type_traits>
+#include <vector>
+
+#include "ostracrv/core/common_types.h"
+#include "ostracrv/core/curvedata.h"
+#include "ostracrv/core/mavikutils.h"
+#include "ostracrv/core/nodetype.h"
+#include "ostracrv/math/vector2d.h"
+
+namespace OstraCrv {
+
+// Mutable arrays of a forked storage, from GetBuffer. count is the length of
+// both arrays after the call.
+template <class T>
+struct CurveBuffer {
+  T* points = nullptr;
+  NODETYPE* nodes = nullptr;
+  int count = 0;
+};
+
+// A read-only record of one subpath inside a path's arrays; owns nothing.
+// limit is set by the subpath walks.
+template <class T>
+struct ConstDrawCurveT {
+  T const* points = nullptr;
+  NODETYPE const* nodes = nullptr;
+  int count = 0;
+  bool limit = false;
+};
+
+// The other point kind: V for POINT and POINT for V.
+template <class T>
+using OtherPointKind =
+    std::conditional_t<std::is_same_v<T, Framework::common_types::POINT>, MavikMath::V, Framework::common_types::POINT>;
+
+template <class T>
+class PolycurveT {
+ public:
+  using point_type = T;
+  using OtherT = OtherPointKind<T>;
+
+  // ---- Construction and lifetime ----
+
+  // An empty curve with its own storage.
+  PolycurveT();
+  // An empty curve with room for n nodes; an implausible n reserves nothing.
+  // Throws std::length_error or std::bad_alloc for an impossible n.
+  explicit PolycurveT(unsigned long n);
+  // A copy of n entries of both arrays. Null arrays or an implausible count
+  // give an empty curve; the arrays are then not read.
+  PolycurveT(T const* points, NODETYPE const* nodes, unsigned long n);
+  // Shares the storage of o: one atomic increment.
+  PolycurveT(PolycurveT const& o) noexcept;
+  // Takes o's storage and leaves o a valid empty curve (o gets a new empty
+  // storage, allocated before anything changes).
+  PolycurveT(PolycurveT&& o);
+  // Takes over one reference to data without incrementing it. A null data
+  // gives an empty curve.
+  explicit PolycurveT(CurveDataBase<T>* data);
+  // The conversion from the other point kind, never shared: node bytes are
+  // copied unchanged; integer to double is exact, double to integer rounds
+  // half away from zero (out-of-range values saturate, NaN becomes 0).
+  explicit PolycurveT(PolycurveT<OtherT> const& o);
+  // Gives up this handle's reference; the last holder deletes the storage.
+  virtual ~PolycurveT();
+
+  // Shares o's storage; nothing happens if both already hold the same one.
+  PolycurveT& operator=(PolycurveT const& o) noexcept;
+  // Swaps the storages: o ends up with this curve's old content.
+  PolycurveT& operator=(PolycurveT&& o) noexcept;
+  void Swap(PolycurveT& o) noexcept;
+
+  // ---- Reads: const, never fork ----
+
+  // The raw arrays (null when empty) and their common length.
+  T const* GetPoints() const noexcept { return data->GetPoints(); }
+  NODETYPE const* GetNodeTypes() const noexcept { return data->GetNodeTypes(); }
+  unsigned long GetPointCount() const noexcept { return data->GetSize(); }
+  bool IsEmpty() const noexcept { return GetPointCount() == 0; }
+
+  // The point at i; a static zero point if i is out of range.
+  T const& GetPoint(int i) const noexcept;
+  // The first or last point; a static zero point on an empty curve.
+  T const& GetFirstPoint() const noexcept;
+  T const& GetLastPoint() const noexcept;
+  // The node byte at i; NodeTypes::Open::move if i is out of range.
+  NODETYPE const& GetNodeType(int i) const noexcept;
+
+  // Ranges over the arrays and over the indices 0 .. count.
+  MavikUtils::RangeView<T const*> Points() const noexcept;
+  MavikUtils::RangeView<NODETYPE const*> NodeTypes() const noexcept;
+  MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>> Indexes() const;
+
+  // Fields of node i. Out of range they answer move, cusp and false.
+  SegmentType GetSegmentType(int i) const noexcept;
+  ContinuityType GetContinuity(int i) const noexcept;
+  bool IsUser(int i) const noexcept;
+  bool IsClosed(int i) const noexcept;
+  bool IsLetter(int i) const noexcept;
+
+  // Copies both arrays out; the caller sizes them. A null destination array
+  // is skipped.
+  void CopyTo(T* points, NODETYPE* nodes) const;
+  // Assigns both vectors the content of the curve.
+  void GetCurve(std::vector<T>& points, std::vector<NODETYPE>& nodes) const;
+  // Whether both handles hold the same storage object.
+  bool IsSameData(PolycurveT const& o) const noexcept { return data == o.data; }
+  // A hook for consistency checks in debugging builds; does nothing.
+  void DebugCheck() const noexcept {}
+
+  // ---- Writes: each forks first, unless it would change nothing ----
+
+  // Forks and returns the (now unshared, owning) storage.
+  CurveData<T>* GetCurveData();
+
+  // Set one entry; false, without a fork, if i is out of range.
+  bool SetPoint(int i, T const& p);
+  bool SetNodeType(int i, NODETYPE const& n);
+  // Set the first or last point; false on an empty curve.
+  bool SetFirstPoint(T const& p);
+  bool SetLastPoint(T const& p);
+  // Change one field of node i and nothing else, not even the twin of a
+  // closed end; no-op if i is out of range.
+  void SetSegmentType(int i, SegmentType t);
+  void SetNodeClosed(int i, bool closed);
+  void SetUserNode(int i, bool user);
+  void SetLetter(int i, bool letter);
+  // Sets the continuity of node i and of its twin if i is a closed end;
+  // no-op if i is out of range.
+  void SetContinuity(int i, ContinuityType c);
+  // Clears the letter bit of every node; returns whether any was set. Forks
+  // only if there is a bit to clear.
+  bool ClearLetterFlags();
+  // Clears the user bit of every arc node. Forks only if one is set.
+  void ClearUserFlagOnArcs();
+
+  // Room for n nodes without reallocation. On shared storage the content is
+  // copied once into arrays of that capacity. An implausible n does nothing.
+  // Throws like the constructor.
+  void Reserve(unsigned long n);
+  // Cuts the arrays to n entries; nothing (no fork) if there are at most n.
+  void Truncate(unsigned long n);
+  // Empties the curve: an unshared storage object is kept, a shared or
+  // borrowed one is replaced by a new empty storage.
+  void Clear();
+  // Puts the content of the two vectors in. On unshared storage the vectors
+  // are swapped, so the caller gets the old content back; otherwise new
+  // storage takes them and they end up empty. Never copies. A longer vector is
+  // first cut to the length of the shorter.
+  void MoveData(std::vector<T>& points, std::vector<NODETYPE>& nodes);
+  // Makes the curve independent of borrowed arrays: borrowed storage is
+  // copied, owning storage (even shared) is kept as it is.
+  void EnsureDataOwnership();
+
+  // Replace the whole content by a copy. The raw form refuses null arrays
+  // with n > 0 and implausible counts (false, nothing changed); n = 0 empties
+  // the curve. The vector form refuses an empty point vector and uses the
+  // shorter of the two lengths. The curve form copies o's arrays.
+  bool SetPoints(T const* points, NODETYPE const* nodes, unsigned long n);
+  bool SetPoints(std::vector<T> const& points, std::vector<NODETYPE> const& nodes);
+  bool SetPoints(PolycurveT const& o);
+
+  // Append one node.
+  void PushBack(T const& p, NODETYPE const& n);
+  // Append n entries. Refused (false, nothing changed) like SetPoints; n = 0
+  // returns true without a fork. The vector form as in SetPoints.
+  bool PushBack(T const* points, NODETYPE const* nodes, unsigned long n);
+  bool PushBack(std::vector<T> const& points, std::vector<NODETYPE> const& nodes);
+  // Append entries of the other point kind, converted as by the conversion
+  // constructor.
+  bool PushBack(OtherT const* points, NODETYPE const* nodes, unsigned long n);
+  // Append the arrays of o. An empty curve shares o's storage instead of
+  // copying (and copies only if o views borrowed arrays).
+  void PushBack(PolycurveT const& o);
+
+  // ---- Buffer protocol ----
+
+  // Forks; returns the arrays and the current count.
+  CurveBuffer<T> GetBuffer();
+  // Arrays of at least n entries; new entries are zero.
+  CurveBuffer<T> GetBuffer(int n) { return GetBuffer(n, false); }
+  // Arrays of exactly n entries; new entries are zero.
+  CurveBuffer<T> GetBufferSetCount(int n) { return GetBuffer(n, true); }
+  // At least (setCount false) or exactly (setCount true) n entries. Shared
+  // storage that must grow is copied once into arrays of the final length
+  // rather than copied and then grown. A negative n behaves as GetBuffer().
+  // Throws std::length_error or std::bad_alloc for an impossible n, with the
+  // handle unchanged.
+  CurveBuffer<T> GetBuffer(int n, bool setCount);
+  // Does nothing.
+  void ReleaseBuffer() noexcept {}
+  // Forks and cuts the arrays to n entries if they are longer; never grows.
+  // A negative n does nothing.
+  void ReleaseBuffer(int n);
+  // As ReleaseBuffer(n); false, with nothing changed, for a negative n.
+  bool ReleaseBufferInternal(int n);
+
+  // ---- Comparison ----
+
+  // Orders by node count first (-1 fewer, 1 more), then by the bytes of the
+  // point arrays, then of the node arrays; 0 if equal. Coordinates compare as
+  // bit patterns, so 0.0 and -0.0 differ and a NaN equals the same NaN. The
+  // result is -1, 0 or 1, but callers should rely only on its sign.
+  int Compare(PolycurveT const& o) const noexcept;
+  bool operator==(PolycurveT const& o) const noexcept { return Compare(o) == 0; }
+  bool operator<(PolycurveT const& o) const noexcept { return Compare(o) < 0; }
+
+ protected:
+  // The storage this handle holds one reference to; never null.
+  CurveDataBase<T>* data;
+
+  // Forks data and returns it as the owning storage it now is.
+  CurveData<T>* ForkData();
+  // Appends m entries, copying shared storage once into arrays of the final
+  // length. The arguments have been checked.
+  void Append(T const* points, NODETYPE const* nodes, unsigned long m);
+};
+
+// A handle over arrays that the caller owns and keeps alive as long as any
+// handle shares the view. Reads see the caller's arrays without a copy; the
+// first write through any handle forks away, so the arrays are never written.
+template <class T>
+class PolycurveRefT : public PolycurveT<T> {
+ public:
+  // A view of n entries; null arrays or an implausible count give an empty
+  // curve.
+  PolycurveRefT(T const* points, NODETYPE const* nodes, unsigned long n);
+  using PolycurveT<T>::operator=;
+};
+
+// A curve of straight lines through n points, owning a copy. Closed only if
+// closed is true and n >= 2; a closed polyline ends on a copy of its first
+// point (added if the last point differs from the first). Null points with
+// n > 0 give an empty curve.
+template <class T>
+class PolylineT : public PolycurveT<T> {
+ public:
+  PolylineT(T const* points, unsigned long n, bool closed);
+  using PolycurveT<T>::operator=;
+};
+
+using Polycurve = PolycurveT<Framework::common_types::POINT>;
+using PolycurveD = PolycurveT<MavikMath::V>;
+using PolycurveRef = PolycurveRefT<Framework::common_types::POINT>;
+using PolycurveRefD = PolycurveRefT<MavikMath::V>;
+using Polyline = PolylineT<Framework::common_types::POINT>;
+using PolylineD = PolylineT<MavikMath::V>;
+
+extern template class PolycurveT<Framework::common_types::POINT>;
+extern template class PolycurveT<MavikMath::V>;
+extern template class PolycurveRefT<Framework::common_types::POINT>;
+extern template class PolycurveRefT<MavikMath::V>;
+extern template class PolylineT<Framework::common_types::POINT>;
+extern template class PolylineT<MavikMath::V>;
+
+}  // namespace OstraCrv

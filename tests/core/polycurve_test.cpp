@@ -1,0 +1,805 @@
+// Copy-on-write handles: sharing and forking, borrowed arrays, the buffer
+// protocol, ordering, polylines, conversion between point kinds, bad input,
+// and a long random run of edits checked against plain vectors.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <climits>
+#include <cmath>
+#include <cstring>
+#include <random>
+#include <stdexcept>
+#include <vector>
+
+#include "polycurve.h"
+
+namespace {
+
+using Framework::common_types::POINT;
+using MavikMath::V;
+using OstraCrv::PolycurveRefT;
+using OstraCrv::PolycurveT;
+using OstraCrv::PolylineT;
+
+template <class T>
+T Pt(double x, double y) {
+  if constexpr (std::is_same_v<T, POINT>)
+    return POINT{int32_t(x), int32_t(y)};
+  else
+    return V{x, y};
+}
+
+// Rounding half away from zero, written independently of the library.
+int32_t RoundHalfAway(double x) { return int32_t(x < 0 ? std::ceil(x - 0.5) : std::floor(x + 0.5)); }
+
+template <class T>
+struct Model {
+  std::vector<T> pts;
+  std::vector<NODETYPE> nodes;
+};
+
+template <class T>
+bool BytesEqual(const T* a, const T* b, size_t n) {
+  return n == 0 || std::memcmp(a, b, n * sizeof(T)) == 0;
+}
+
+// The handle shows exactly the model's arrays, through every read path.
+template <class T>
+::testing::AssertionResult Matches(const PolycurveT<T>& c, const Model<T>& m) {
+  const size_t n = m.pts.size();
+  if (c.GetPointCount() != n) return ::testing::AssertionFailure() << "count " << c.GetPointCount() << " vs " << n;
+  if (c.IsEmpty() != (n == 0)) return ::testing::AssertionFailure() << "IsEmpty";
+  if (n == 0 && (c.GetPoints() || c.GetNodeTypes())) return ::testing::AssertionFailure() << "non-null when empty";
+  if (!BytesEqual(c.GetPoints(), m.pts.data(), n)) return ::testing::AssertionFailure() << "points differ";
+  if (!BytesEqual(c.GetNodeTypes(), m.nodes.data(), n)) return ::testing::AssertionFailure() << "nodes differ";
+  std::vector<T> p;
+  std::vector<NODETYPE> nd;
+  c.GetCurve(p, nd);
+  if (p.size() != n || nd != m.nodes || !BytesEqual(p.data(), m.pts.data(), n))
+    return ::testing::AssertionFailure() << "GetCurve differs";
+  const T zero{};
+  if (!BytesEqual(&c.GetPoint(int(n)), &zero, 1) || c.GetNodeType(int(n)) != 0x04)
+    return ::testing::AssertionFailure() << "default past the end";
+  if (n > 0 && (!BytesEqual(&c.GetFirstPoint(), &m.pts.front(), 1) || !BytesEqual(&c.GetLastPoint(), &m.pts.back(), 1)))
+    return ::testing::AssertionFailure() << "first/last";
+  return ::testing::AssertionSuccess();
+}
+
+template <class T>
+class PolycurveTyped : public ::testing::Test {};
+using PointKinds = ::testing::Types<POINT, V>;
+TYPED_TEST_SUITE(PolycurveTyped, PointKinds);
+
+// An open path of lines through n points (x = i, y = 10 i).
+template <class T>
+Model<T> Line(int n, int offset = 0) {
+  Model<T> m;
+  for (int i = 0; i < n; ++i) {
+    m.pts.push_back(Pt<T>(i + offset, 10 * i));
+    m.nodes.push_back(i == 0 ? NodeTypes::Open::move : NodeTypes::Open::line);
+  }
+  return m;
+}
+
+template <class T>
+PolycurveT<T> Make(const Model<T>& m) {
+  return PolycurveT<T>(m.pts.data(), m.nodes.data(), m.pts.size());
+}
+
+// ---- Sharing ---------------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, CopySharesUntilTheFirstWrite) {
+  using T = TypeParam;
+  const Model<T> m = Line<T>(5);
+  PolycurveT<T> a = Make(m);
+  PolycurveT<T> b(a);
+  EXPECT_TRUE(a.IsSameData(b));
+  EXPECT_EQ(a.GetPoints(), b.GetPoints());
+
+  // Writes out of range change nothing and do not fork.
+  EXPECT_FALSE(b.SetPoint(5, Pt<T>(1, 1)));
+  EXPECT_FALSE(b.SetPoint(-1, Pt<T>(1, 1)));
+  EXPECT_FALSE(b.SetNodeType(7, NodeTypes::arc));
+  b.SetSegmentType(9, SegmentType::arc);
+  b.SetContinuity(-2, ContinuityType::smooth);
+  b.Truncate(5);
+  EXPECT_FALSE(b.ReleaseBufferInternal(-1));
+  EXPECT_TRUE(a.IsSameData(b));
+
+  EXPECT_TRUE(b.SetPoint(2, Pt<T>(99, 98)));
+  EXPECT_FALSE(a.IsSameData(b));
+  EXPECT_TRUE(Matches(a, m));
+  Model<T> m2 = m;
+  m2.pts[2] = Pt<T>(99, 98);
+  EXPECT_TRUE(Matches(b, m2));
+
+  // The sole holder writes in place.
+  const T* before = b.GetPoints();
+  b.SetPoint(0, Pt<T>(-1, -1));
+  b.SetNodeType(1, NodeTypes::Open::curve);
+  EXPECT_EQ(b.GetPoints(), before);
+
+  // Assignment shares; self-assignment is harmless.
+  b = a;
+  EXPECT_TRUE(a.IsSameData(b));
+  b = *&b;
+  EXPECT_TRUE(Matches(b, m));
+}
+
+TYPED_TEST(PolycurveTyped, MoveFormsLeaveTheSourceAsSpecified) {
+  using T = TypeParam;
+  const Model<T> ma = Line<T>(4), mb = Line<T>(2, 100);
+  PolycurveT<T> a = Make(ma), b = Make(mb);
+
+  // Move assignment swaps: the source gets the target's old content.
+  a = std::move(b);
+  EXPECT_TRUE(Matches(a, mb));
+  EXPECT_TRUE(Matches(b, ma));  // NOLINT(bugprone-use-after-move)
+
+  // The move constructor leaves the source a valid empty curve, which can be
+  // written again.
+  PolycurveT<T> c(std::move(a));
+  EXPECT_TRUE(Matches(c, mb));
+  EXPECT_TRUE(a.IsEmpty());  // NOLINT(bugprone-use-after-move)
+  EXPECT_FALSE(a.IsSameData(c));
+  a.PushBack(Pt<T>(3, 4), NodeTypes::Open::move);
+  EXPECT_EQ(a.GetPointCount(), 1u);
+
+  c.Swap(b);
+  EXPECT_TRUE(Matches(c, ma));
+  EXPECT_TRUE(Matches(b, mb));
+}
+
+// ---- Borrowed arrays -------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, ReferenceNeverWritesTheCallersArrays) {
+  using T = TypeParam;
+  Model<T> caller = Line<T>(6);
+  caller.nodes[5] = NodeTypes::Open::line | NodeMask::kLetter;
+  const Model<T> snapshot = caller;
+
+  PolycurveRefT<T> r(caller.pts.data(), caller.nodes.data(), caller.pts.size());
+  // Reads see the caller's memory directly and answer as an owning copy.
+  EXPECT_EQ(r.GetPoints(), caller.pts.data());
+  EXPECT_EQ(r.Compare(Make(caller)), 0);
+
+  PolycurveT<T> shared(r);
+  PolycurveT<T> other(r);
+  r.SetPoint(0, Pt<T>(-7, -7));
+  r.SetContinuity(3, ContinuityType::symm);
+  r.ClearLetterFlags();
+  shared.PushBack(Pt<T>(1, 2), NodeTypes::Open::line);
+  other.GetBufferSetCount(2).points[1] = Pt<T>(5, 5);
+  other.ReleaseBufferInternal(1);
+
+  EXPECT_TRUE(BytesEqual(caller.pts.data(), snapshot.pts.data(), 6));
+  EXPECT_EQ(caller.nodes, snapshot.nodes);
+  EXPECT_NE(r.GetPoints(), caller.pts.data());
+  EXPECT_EQ(r.GetNodeType(3), WithContinuity(NodeTypes::Open::line, ContinuityType::symm));
+  EXPECT_EQ(shared.GetPointCount(), 7u);
+  EXPECT_EQ(other.GetPointCount(), 1u);
+
+  // Taking ownership copies borrowed arrays: later changes by the caller are
+  // not seen.
+  PolycurveRefT<T> view(caller.pts.data(), caller.nodes.data(), caller.pts.size());
+  PolycurveT<T> keep(view);
+  keep.EnsureDataOwnership();
+  EXPECT_FALSE(keep.IsSameData(view));
+  caller.pts[1] = Pt<T>(1000, 1000);
+  EXPECT_TRUE(Matches(keep, snapshot));
+
+  // On owning storage ownership is already there, and sharing stays.
+  PolycurveT<T> a = Make(snapshot), b(a);
+  b.EnsureDataOwnership();
+  EXPECT_TRUE(a.IsSameData(b));
+}
+
+TYPED_TEST(PolycurveTyped, AppendingToAnEmptyCurveShares) {
+  using T = TypeParam;
+  const Model<T> m = Line<T>(3);
+  const PolycurveT<T> src = Make(m);
+  PolycurveT<T> empty;
+  empty.PushBack(src);
+  EXPECT_TRUE(empty.IsSameData(src));
+
+  // ... except from a borrowed view, which is copied.
+  PolycurveRefT<T> view(m.pts.data(), m.nodes.data(), m.pts.size());
+  PolycurveT<T> e2;
+  e2.PushBack(view);
+  EXPECT_FALSE(e2.IsSameData(view));
+  EXPECT_NE(e2.GetPoints(), m.pts.data());
+  EXPECT_TRUE(Matches(e2, m));
+
+  // Appending a curve to itself doubles it.
+  PolycurveT<T> self = Make(m);
+  self.PushBack(self);
+  Model<T> twice = m;
+  twice.pts.insert(twice.pts.end(), m.pts.begin(), m.pts.end());
+  twice.nodes.insert(twice.nodes.end(), m.nodes.begin(), m.nodes.end());
+  EXPECT_TRUE(Matches(self, twice));
+}
+
+// ---- Buffer protocol -------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, BufferRoundTrips) {
+  using T = TypeParam;
+  const Model<T> m = Line<T>(4);
+  PolycurveT<T> a = Make(m);
+  PolycurveT<T> b(a);
+
+  // Growing shared storage: prefix kept, new entries zero, the other handle
+  // untouched.
+  auto buf = b.GetBuffer(10);
+  ASSERT_EQ(buf.count, 10);
+  EXPECT_TRUE(BytesEqual(buf.points, m.pts.data(), 4));
+  EXPECT_TRUE(BytesEqual(buf.nodes, m.nodes.data(), 4));
+  const T zero{};
+  for (int i = 4; i < 10; ++i) {
+    EXPECT_TRUE(BytesEqual(&buf.points[i], &zero, 1));
+    EXPECT_EQ(buf.nodes[i], 0);
+  }
+  EXPECT_TRUE(Matches(a, m));
+
+  // Edit in place with a flat function, then give the count back.
+  buf.points[4] = Pt<T>(40, 40);
+  buf.nodes[4] = NodeTypes::Open::line;
+  CRV_SetCont(buf.nodes, 5, 2, ContinuityType::smooth);
+  EXPECT_TRUE(b.ReleaseBufferInternal(5));
+  Model<T> expect = m;
+  expect.pts.push_back(Pt<T>(40, 40));
+  expect.nodes.push_back(NodeTypes::Open::line);
+  expect.nodes[2] = WithContinuity(expect.nodes[2], ContinuityType::smooth);
+  EXPECT_TRUE(Matches(b, expect));
+
+  // "At least" never shrinks; "exactly" does; release never grows.
+  EXPECT_EQ(b.GetBuffer(2).count, 5);
+  EXPECT_EQ(b.GetBuffer().count, 5);
+  b.ReleaseBuffer(50);
+  EXPECT_EQ(b.GetPointCount(), 5u);
+  EXPECT_EQ(b.GetBufferSetCount(3).count, 3);
+  EXPECT_EQ(b.GetPointCount(), 3u);
+  EXPECT_FALSE(b.ReleaseBufferInternal(-1));
+  EXPECT_EQ(b.GetPointCount(), 3u);
+  EXPECT_EQ(b.GetBuffer(-4).count, 3);
+  b.ReleaseBuffer();
+  EXPECT_TRUE(BytesEqual(b.GetPoints(), m.pts.data(), 3));
+
+  // A buffer of a borrowed view is a private copy.
+  PolycurveRefT<T> view(m.pts.data(), m.nodes.data(), 4);
+  auto vb = view.GetBuffer();
+  EXPECT_NE(vb.points, m.pts.data());
+  EXPECT_EQ(vb.count, 4);
+}
+
+TYPED_TEST(PolycurveTyped, ImpossibleRequestsThrowAndLeaveTheCurve) {
+  using T = TypeParam;
+  const Model<T> m = Line<T>(3);
+  PolycurveT<T> a = Make(m), b(a);
+  const unsigned long huge = ~0ul >> 1;
+  EXPECT_THROW(b.Reserve(huge), std::length_error);  // shared path
+  EXPECT_TRUE(b.IsSameData(a));
+  PolycurveT<T> c = Make(m);
+  EXPECT_THROW(c.Reserve(huge), std::length_error);  // in-place path
+  EXPECT_TRUE(Matches(c, m));
+  EXPECT_TRUE(Matches(b, m));
+}
+
+// ---- Ordering --------------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, CompareOrdersByCountFirst) {
+  using T = TypeParam;
+  const PolycurveT<T> small = Make(Line<T>(2, 1000)), big = Make(Line<T>(3, -1000));
+  EXPECT_EQ(small.Compare(big), -1);
+  EXPECT_EQ(big.Compare(small), 1);
+  EXPECT_TRUE(small < big);
+  EXPECT_FALSE(big < small);
+  EXPECT_EQ(PolycurveT<T>().Compare(PolycurveT<T>()), 0);
+
+  // Equal content in separate storage is equal; nodes break ties of points.
+  Model<T> m = Line<T>(3);
+  PolycurveT<T> x = Make(m), y = Make(m);
+  EXPECT_TRUE(x == y);
+  y.SetNodeType(2, NodeTypes::Open::curve);
+  EXPECT_FALSE(x == y);
+  EXPECT_EQ(x.Compare(y), -y.Compare(x));
+  EXPECT_NE(x.Compare(y), 0);
+
+  // Sorting a mixed set puts them in order of count.
+  std::vector<PolycurveT<T>> all;
+  for (int n : {5, 1, 3, 0, 2, 4, 3}) all.push_back(Make(Line<T>(n, n * 3)));
+  std::sort(all.begin(), all.end());
+  for (size_t i = 1; i < all.size(); ++i) EXPECT_LE(all[i - 1].GetPointCount(), all[i].GetPointCount());
+}
+
+TEST(PolycurveCompare, DoubleCoordinatesCompareAsBits) {
+  const V p0[] = {{0.0, 1.0}}, p1[] = {{-0.0, 1.0}};
+  const NODETYPE n[] = {NodeTypes::Open::move};
+  const OstraCrv::PolycurveD a(p0, n, 1), b(p1, n, 1);
+  EXPECT_NE(a.Compare(b), 0);
+  EXPECT_FALSE(a == b);
+  EXPECT_EQ(a.Compare(b) < 0, b.Compare(a) > 0);
+  const V q[] = {{std::nan(""), 2.0}};
+  const OstraCrv::PolycurveD c(q, n, 1), d(q, n, 1);
+  EXPECT_TRUE(c == d);
+}
+
+// ---- Polylines -------------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, PolylineNodes) {
+  using T = TypeParam;
+  const T tri[] = {Pt<T>(0, 0), Pt<T>(10, 0), Pt<T>(10, 10)};
+  const PolylineT<T> open(tri, 3, false);
+  EXPECT_EQ(std::vector<NODETYPE>(open.NodeTypes().begin(), open.NodeTypes().end()),
+            (std::vector<NODETYPE>{0x04, 0x44, 0x44}));
+
+  const PolylineT<T> closed(tri, 3, true);
+  ASSERT_EQ(closed.GetPointCount(), 4u);
+  EXPECT_EQ(std::vector<NODETYPE>(closed.NodeTypes().begin(), closed.NodeTypes().end()),
+            (std::vector<NODETYPE>{0x0C, 0x44, 0x44, 0x48}));
+  EXPECT_TRUE(BytesEqual(&closed.GetLastPoint(), &tri[0], 1));
+
+  const T ring[] = {Pt<T>(0, 0), Pt<T>(10, 0), Pt<T>(0, 0)};
+  const PolylineT<T> shut(ring, 3, true);
+  EXPECT_EQ(std::vector<NODETYPE>(shut.NodeTypes().begin(), shut.NodeTypes().end()),
+            (std::vector<NODETYPE>{0x0C, 0x44, 0x48}));
+
+  const PolylineT<T> one(tri, 1, true);
+  ASSERT_EQ(one.GetPointCount(), 1u);
+  EXPECT_EQ(one.GetNodeType(0), 0x04);
+  EXPECT_TRUE(PolylineT<T>(tri, 0, true).IsEmpty());
+  EXPECT_TRUE(PolylineT<T>(nullptr, 5, true).IsEmpty());
+}
+
+// ---- Conversion between point kinds ------------------------------------------
+
+TEST(PolycurveConversion, DoublesRoundHalfAwayFromZero) {
+  const V pts[] = {{2.5, -2.5}, {2.4999, -2.4999}, {0.5, -0.5}, {1e12, -1e12}, {-0.0, 7.0}};
+  const NODETYPE nodes[] = {0x04, 0x45, 0x46, 0x54, 0x48};
+  const OstraCrv::PolycurveD d(pts, nodes, 5);
+  const OstraCrv::Polycurve i(d);
+  const POINT want[] = {{3, -3}, {2, -2}, {1, -1}, {INT32_MAX, INT32_MIN}, {0, 7}};
+  ASSERT_EQ(i.GetPointCount(), 5u);
+  for (int k = 0; k < 5; ++k) {
+    EXPECT_EQ(i.GetPoint(k), want[k]) << k;
+    EXPECT_EQ(i.GetNodeType(k), nodes[k]);
+  }
+  // The raw cross-kind append rounds the same way and forks nothing for n = 0.
+  OstraCrv::Polycurve j = i, k2 = i;
+  EXPECT_TRUE(k2.PushBack(static_cast<const V*>(nullptr), nullptr, 0));
+  EXPECT_TRUE(k2.IsSameData(i));
+  EXPECT_TRUE(j.PushBack(pts, nodes, 3));
+  ASSERT_EQ(j.GetPointCount(), 8u);
+  EXPECT_EQ(j.GetPoint(5), (POINT{3, -3}));
+  EXPECT_EQ(j.GetPoint(6), (POINT{2, -2}));
+  EXPECT_TRUE(Matches(i, Model<POINT>{{want, want + 5}, {nodes, nodes + 5}}));
+}
+
+TEST(PolycurveConversion, IntegersSurviveARoundTrip) {
+  std::mt19937 rng(7);
+  std::uniform_int_distribution<int32_t> any(INT32_MIN, INT32_MAX);
+  std::vector<POINT> pts(500);
+  std::vector<NODETYPE> nodes(500);
+  for (auto& p : pts) p = {any(rng), any(rng)};
+  pts[0] = {INT32_MIN, INT32_MAX};
+  for (auto& n : nodes) n = NODETYPE(rng());
+  const OstraCrv::Polycurve a(pts.data(), nodes.data(), pts.size());
+  const OstraCrv::PolycurveD d(a);
+  for (size_t k = 0; k < pts.size(); ++k) ASSERT_EQ(d.GetPoint(int(k)), (V{double(pts[k].x), double(pts[k].y)}));
+  const OstraCrv::Polycurve back(d);
+  EXPECT_TRUE(back == a);
+  EXPECT_FALSE(back.IsSameData(a));
+
+  OstraCrv::PolycurveD e;
+  EXPECT_TRUE(e.PushBack(pts.data(), nodes.data(), 2));
+  EXPECT_EQ(e.GetPoint(1), (V{double(pts[1].x), double(pts[1].y)}));
+}
+
+// ---- Bad input ---------------------------------------------------------------
+
+TYPED_TEST(PolycurveTyped, BadInputGivesFailureValues) {
+  using T = TypeParam;
+  const Model<T> m = Line<T>(3);
+  const unsigned long negative = static_cast<unsigned long>(-1L);
+
+  // Null arrays and negative counts are never read.
+  EXPECT_TRUE(PolycurveT<T>(m.pts.data(), nullptr, 3).IsEmpty());
+  EXPECT_TRUE(PolycurveT<T>(nullptr, m.nodes.data(), 3).IsEmpty());
+  EXPECT_TRUE(PolycurveT<T>(m.pts.data(), m.nodes.data(), negative).IsEmpty());
+  EXPECT_TRUE(PolycurveRefT<T>(m.pts.data(), nullptr, 3).IsEmpty());
+  EXPECT_TRUE(PolycurveRefT<T>(m.pts.data(), m.nodes.data(), negative).IsEmpty());
+  EXPECT_TRUE(PolycurveT<T>(negative).IsEmpty());
+
+  PolycurveT<T> a = Make(m), b(a);
+  EXPECT_FALSE(b.SetPoints(m.pts.data(), nullptr, 2));
+  EXPECT_FALSE(b.SetPoints(m.pts.data(), m.nodes.data(), negative));
+  EXPECT_FALSE(b.SetPoints(std::vector<T>{}, m.nodes));
+  EXPECT_FALSE(b.PushBack(static_cast<const T*>(nullptr), m.nodes.data(), 2));
+  EXPECT_FALSE(b.PushBack(m.pts.data(), m.nodes.data(), negative));
+  EXPECT_FALSE(b.PushBack(std::vector<T>{}, m.nodes));
+  EXPECT_FALSE(b.PushBack(static_cast<const typename PolycurveT<T>::OtherT*>(nullptr), m.nodes.data(), 1));
+  b.Reserve(negative);
+  EXPECT_TRUE(b.IsSameData(a));
+  EXPECT_TRUE(Matches(b, m));
+
+  // Reads out of range answer the static defaults.
+  const T zero{};
+  EXPECT_TRUE(BytesEqual(&a.GetPoint(-1), &zero, 1));
+  EXPECT_TRUE(BytesEqual(&a.GetPoint(3), &zero, 1));
+  EXPECT_EQ(a.GetNodeType(-1), 0x04);
+  EXPECT_EQ(a.GetNodeType(INT_MAX), 0x04);
+  EXPECT_EQ(a.GetSegmentType(3), SegmentType::move);
+  EXPECT_FALSE(a.IsLetter(3));
+  EXPECT_FALSE(a.IsUser(-1));
+  EXPECT_EQ(a.GetContinuity(99), ContinuityType::cusp);
+  const PolycurveT<T> empty;
+  EXPECT_TRUE(BytesEqual(&empty.GetFirstPoint(), &zero, 1));
+  EXPECT_TRUE(BytesEqual(&empty.GetLastPoint(), &zero, 1));
+  PolycurveT<T> e2;
+  EXPECT_FALSE(e2.SetFirstPoint(Pt<T>(1, 1)));
+  EXPECT_FALSE(e2.SetLastPoint(Pt<T>(1, 1)));
+  EXPECT_TRUE(e2.Points().empty());
+  EXPECT_TRUE(e2.Indexes().empty());
+
+  // The vector forms use the shorter length.
+  std::vector<NODETYPE> two(m.nodes.begin(), m.nodes.begin() + 2);
+  EXPECT_TRUE(e2.SetPoints(m.pts, two));
+  EXPECT_EQ(e2.GetPointCount(), 2u);
+  // A raw count of zero empties.
+  EXPECT_TRUE(e2.SetPoints(nullptr, nullptr, 0));
+  EXPECT_TRUE(e2.IsEmpty());
+}
+
+// ---- Field writers ----------------------------------------------------------
+
+// (The single-field writers and ClearLetterFlags are checked by the random run.)
+TEST(PolycurveFields, ContinuityReachesTheTwinArcsLoseTheUserBit) {
+  // A closed triangle of lines: nodes 0 and 3 are twins.
+  const POINT pts[] = {{0, 0}, {10, 0}, {10, 10}, {0, 0}};
+  const OstraCrv::PolylineT<POINT> tri(pts, 3, true);
+  OstraCrv::Polycurve c(tri);
+  c.SetContinuity(3, ContinuityType::smooth);
+  EXPECT_EQ(c.GetContinuity(0), ContinuityType::smooth);
+  EXPECT_EQ(c.GetContinuity(3), ContinuityType::smooth);
+  EXPECT_EQ(tri.GetContinuity(0), ContinuityType::cusp);
+
+  const POINT bz[] = {{0, 0}, {1, 1}, {2, 1}, {3, 0}};
+  const NODETYPE bn[] = {0x04, 0xC4, 0xC5, 0x84};
+  OstraCrv::Polycurve f(bz, bn, 4);
+  f.ClearUserFlagOnArcs();
+  EXPECT_EQ(f.GetNodeType(1), 0xC0);
+  EXPECT_EQ(f.GetNodeType(2), 0xC1);
+  EXPECT_EQ(f.GetNodeType(3), 0x84);
+
+  POINT outP[4] = {};
+  NODETYPE outN[4] = {};
+  f.CopyTo(outP, outN);
+  EXPECT_TRUE(BytesEqual(outP, bz, 4));
+  EXPECT_EQ(outN[1], 0xC0);
+  f.CopyTo(nullptr, outN);  // a null destination is skipped
+}
+
+// ---- Random edits against a reference model ----------------------------------
+
+// The storage's Replace against vector erase/insert, including clamped
+// positions and sources inside the storage itself.
+TEST(CurveDataReplace, MatchesVectorSplicing) {
+  std::mt19937 rng(99);
+  auto pick = [&](int lo, int hi) { return std::uniform_int_distribution<int>(lo, hi)(rng); };
+  OstraCrv::CurveData<POINT> d;
+  std::vector<POINT> mp;
+  std::vector<NODETYPE> mn;
+  for (int step = 0; step < 5000; ++step) {
+    const int size = int(mp.size());
+    const int pos = pick(0, size + 3), count = pick(0, size + 3), m = pick(0, 6);
+    std::vector<POINT> sp(m);
+    std::vector<NODETYPE> sn(m);
+    for (int i = 0; i < m; ++i) sp[i] = {pick(-9, 9), pick(-9, 9)}, sn[i] = NODETYPE(rng());
+    const POINT* src = sp.data();
+    const NODETYPE* srcN = sn.data();
+    int mm = m;
+    if (size > 0 && pick(0, 2) == 0) {  // take the source from the storage itself
+      const int from = pick(0, size - 1);
+      mm = pick(0, size - from);
+      src = d.points.data() + from;
+      srcN = d.nodes.data() + from;
+      sp.assign(mp.begin() + from, mp.begin() + from + mm);
+      sn.assign(mn.begin() + from, mn.begin() + from + mm);
+    }
+    d.Replace(unsigned(pos), unsigned(count), src, srcN, unsigned(mm));
+    const int p0 = std::min(pos, size), c0 = std::min(count, size - p0);
+    mp.erase(mp.begin() + p0, mp.begin() + p0 + c0);
+    mp.insert(mp.begin() + p0, sp.begin(), sp.begin() + mm);
+    mn.erase(mn.begin() + p0, mn.begin() + p0 + c0);
+    mn.insert(mn.begin() + p0, sn.begin(), sn.begin() + mm);
+    ASSERT_EQ(d.points, mp) << step;
+    ASSERT_EQ(d.nodes, mn) << step;
+    if (mp.size() > 40) {
+      d.Truncate(5);
+      mp.resize(5);
+      mn.resize(5);
+    }
+  }
+  // Null sources with a count change nothing.
+  const auto before = d.points;
+  d.Replace(0, 2, nullptr, nullptr, 3);
+  EXPECT_EQ(d.points, before);
+}
+
+template <class T>
+T RandomPoint(std::mt19937& rng) {
+  std::uniform_int_distribution<int> d(-40, 40);
+  if constexpr (std::is_same_v<T, POINT>) {
+    return POINT{d(rng), d(rng)};
+  } else {
+    const int k = d(rng);
+    // Include signed zeros and halves so that bit-wise comparison matters.
+    return V{k == 0 ? -0.0 : k / 2.0, double(d(rng)) / 4.0};
+  }
+}
+
+template <class T>
+Model<T> RandomArrays(std::mt19937& rng, int maxN) {
+  Model<T> m;
+  const int n = std::uniform_int_distribution<int>(0, maxN)(rng);
+  for (int i = 0; i < n; ++i) {
+    m.pts.push_back(RandomPoint<T>(rng));
+    m.nodes.push_back(NODETYPE(rng()));
+  }
+  return m;
+}
+
+template <class T>
+int ModelCompare(const Model<T>& a, const Model<T>& b) {
+  if (a.pts.size() != b.pts.size()) return a.pts.size() < b.pts.size() ? -1 : 1;
+  if (a.pts.empty()) return 0;
+  const auto* pa = reinterpret_cast<const unsigned char*>(a.pts.data());
+  const auto* pb = reinterpret_cast<const unsigned char*>(b.pts.data());
+  const size_t bytes = a.pts.size() * sizeof(T);
+  if (std::lexicographical_compare(pa, pa + bytes, pb, pb + bytes)) return -1;
+  if (std::lexicographical_compare(pb, pb + bytes, pa, pa + bytes)) return 1;
+  if (a.nodes < b.nodes) return -1;
+  if (b.nodes < a.nodes) return 1;
+  return 0;
+}
+
+TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
+  using T = TypeParam;
+  using Other = typename PolycurveT<T>::OtherT;
+  std::mt19937 rng(20240611);
+  auto pick = [&](int lo, int hi) { return std::uniform_int_distribution<int>(lo, hi)(rng); };
+
+  // Borrowed arrays that must never change, with their snapshots.
+  std::vector<Model<T>> pool, poolSnap;
+  for (int k = 0; k < 3; ++k) pool.push_back(RandomArrays<T>(rng, 8));
+  poolSnap = pool;
+
+  constexpr int kSlots = 5;
+  std::vector<PolycurveT<T>> h(kSlots);
+  std::vector<Model<T>> m(kSlots);
+
+  for (int step = 0; step < 20000; ++step) {
+    const int a = pick(0, kSlots - 1), b = pick(0, kSlots - 1);
+    PolycurveT<T>& c = h[a];
+    Model<T>& mm = m[a];
+    const int n = int(mm.pts.size());
+    const int op = pick(0, 25);
+    switch (op) {
+      case 0:
+        c = h[b];
+        mm = m[b];
+        break;
+      case 1: {
+        const int k = pick(-1, n + 1);
+        c.ReleaseBuffer(k);
+        if (k >= 0 && k < n) {
+          mm.pts.resize(k);
+          mm.nodes.resize(k);
+        }
+        break;
+      }
+      case 2: {
+        const int i = pick(-2, n + 1);
+        const T p = RandomPoint<T>(rng);
+        EXPECT_EQ(c.SetPoint(i, p), i >= 0 && i < n);
+        if (i >= 0 && i < n) mm.pts[i] = p;
+        break;
+      }
+      case 3: {
+        const int i = pick(-2, n + 1);
+        const NODETYPE v = NODETYPE(rng());
+        EXPECT_EQ(c.SetNodeType(i, v), i >= 0 && i < n);
+        if (i >= 0 && i < n) mm.nodes[i] = v;
+        break;
+      }
+      case 4: {
+        const T p = RandomPoint<T>(rng);
+        const NODETYPE v = NODETYPE(rng());
+        c.PushBack(p, v);
+        mm.pts.push_back(p);
+        mm.nodes.push_back(v);
+        break;
+      }
+      case 5: {
+        const Model<T> r = RandomArrays<T>(rng, 5);
+        EXPECT_TRUE(c.PushBack(r.pts.data(), r.nodes.data(), r.pts.size()));
+        mm.pts.insert(mm.pts.end(), r.pts.begin(), r.pts.end());
+        mm.nodes.insert(mm.nodes.end(), r.nodes.begin(), r.nodes.end());
+        break;
+      }
+      case 6: {
+        const Model<T> add = m[b];  // b may be a itself
+        c.PushBack(h[b]);
+        mm.pts.insert(mm.pts.end(), add.pts.begin(), add.pts.end());
+        mm.nodes.insert(mm.nodes.end(), add.nodes.begin(), add.nodes.end());
+        break;
+      }
+      case 7: {
+        const Model<T> r = RandomArrays<T>(rng, 9);
+        EXPECT_TRUE(c.SetPoints(r.pts.data(), r.nodes.data(), r.pts.size()));
+        mm = r;
+        break;
+      }
+      case 8:
+        EXPECT_TRUE(c.SetPoints(h[b]));
+        mm = m[b];
+        break;
+      case 9: {
+        const int k = pick(0, n + 2);
+        c.Truncate(unsigned(k));
+        if (k < n) {
+          mm.pts.resize(k);
+          mm.nodes.resize(k);
+        }
+        break;
+      }
+      case 10:
+        c.Clear();
+        mm = Model<T>();
+        break;
+      case 11: {
+        const int want = pick(-1, n + 5);
+        const bool exact = pick(0, 1) == 1;
+        auto buf = c.GetBuffer(want, exact);
+        if (want >= 0 && (exact ? want != n : want > n)) {
+          mm.pts.resize(want);
+          mm.nodes.resize(want);
+        }
+        ASSERT_EQ(buf.count, int(mm.pts.size()));
+        for (int w = pick(0, 3); w > 0 && buf.count > 0; --w) {
+          const int i = pick(0, buf.count - 1);
+          buf.points[i] = mm.pts[i] = RandomPoint<T>(rng);
+          buf.nodes[i] = mm.nodes[i] = NODETYPE(rng());
+        }
+        const int keep = pick(-1, buf.count + 2);
+        EXPECT_EQ(c.ReleaseBufferInternal(keep), keep >= 0);
+        if (keep >= 0 && keep < buf.count) {
+          mm.pts.resize(keep);
+          mm.nodes.resize(keep);
+        }
+        break;
+      }
+      case 12: {
+        Model<T> r = RandomArrays<T>(rng, 6);
+        const Model<T> in = r, old = mm;
+        c.MoveData(r.pts, r.nodes);
+        mm = in;
+        // The caller gets the old arrays back or empty vectors.
+        const bool gotOld = r.pts.size() == old.pts.size() && BytesEqual(r.pts.data(), old.pts.data(), r.pts.size()) &&
+                            r.nodes == old.nodes;
+        EXPECT_TRUE(gotOld || (r.pts.empty() && r.nodes.empty()));
+        break;
+      }
+      case 13:
+        c.Swap(h[b]);
+        if (a != b) std::swap(mm, m[b]);
+        break;
+      case 14:
+        c = std::move(h[b]);
+        if (a != b) std::swap(mm, m[b]);
+        break;
+      case 15: {
+        PolycurveT<T> t(std::move(h[b]));
+        EXPECT_TRUE(h[b].IsEmpty());  // NOLINT(bugprone-use-after-move)
+        h[a] = t;
+        if (a != b) {
+          m[a] = m[b];
+          m[b] = Model<T>();
+        }
+        break;
+      }
+      case 16: {
+        const int i = pick(-1, n);
+        const auto cont = ContinuityType(pick(0, 2));
+        c.SetContinuity(i, cont);
+        CRV_SetCont(mm.nodes.data(), n, i, cont);
+        break;
+      }
+      case 17:
+        c.Reserve(unsigned(pick(0, 3 * n + 3)));
+        break;
+      case 18:
+        c.EnsureDataOwnership();
+        break;
+      case 19: {
+        const Model<T>& src = pool[pick(0, 2)];
+        c = PolycurveRefT<T>(src.pts.data(), src.nodes.data(), src.pts.size());
+        mm = src;
+        break;
+      }
+      case 20: {
+        const int i = pick(-1, n);
+        const bool on = pick(0, 1) == 1;
+        const int which = pick(0, 3);
+        if (i >= 0 && i < n) {
+          NODETYPE& v = mm.nodes[i];
+          const NODETYPE mask = which == 1 ? NodeMask::kClosed : which == 2 ? NodeMask::kUser : NodeMask::kLetter;
+          if (which == 0) {
+            v = NODETYPE((v & 0x3F) | (on ? 0x80 : 0x40));
+          } else {
+            v = NODETYPE(on ? (v | mask) : (v & ~mask));
+          }
+        }
+        if (which == 0) c.SetSegmentType(i, on ? SegmentType::curve : SegmentType::line);
+        if (which == 1) c.SetNodeClosed(i, on);
+        if (which == 2) c.SetUserNode(i, on);
+        if (which == 3) c.SetLetter(i, on);
+        break;
+      }
+      case 21: {
+        bool any = false;
+        for (auto& v : mm.nodes) {
+          any |= (v & NodeMask::kLetter) != 0;
+          v = NODETYPE(v & ~NodeMask::kLetter);
+        }
+        EXPECT_EQ(c.ClearLetterFlags(), any);
+        break;
+      }
+      case 22: {
+        const Model<Other> r = RandomArrays<Other>(rng, 4);
+        EXPECT_TRUE(c.PushBack(r.pts.data(), r.nodes.data(), r.pts.size()));
+        for (size_t k = 0; k < r.pts.size(); ++k) {
+          if constexpr (std::is_same_v<T, POINT>)
+            mm.pts.push_back(POINT{RoundHalfAway(r.pts[k].x), RoundHalfAway(r.pts[k].y)});
+          else
+            mm.pts.push_back(V{double(r.pts[k].x), double(r.pts[k].y)});
+          mm.nodes.push_back(r.nodes[k]);
+        }
+        break;
+      }
+      case 23: {
+        c = PolycurveT<T>(PolycurveT<Other>(c));
+        if constexpr (std::is_same_v<T, V>)
+          for (auto& p : mm.pts) p = V{double(RoundHalfAway(p.x)), double(RoundHalfAway(p.y))};
+        break;
+      }
+      case 24: {
+        // Append a stretch of the curve's own arrays (they may move meanwhile).
+        const int from = pick(0, n), k = pick(0, n - from);
+        EXPECT_TRUE(c.PushBack(c.GetPoints() + from, c.GetNodeTypes() + from, unsigned(k)));
+        const Model<T> old = mm;
+        mm.pts.insert(mm.pts.end(), old.pts.begin() + from, old.pts.begin() + from + k);
+        mm.nodes.insert(mm.nodes.end(), old.nodes.begin() + from, old.nodes.begin() + from + k);
+        break;
+      }
+      case 25: {
+        // Replace the content by an overlapping stretch of itself.
+        const int from = pick(0, n), k = pick(0, n - from);
+        EXPECT_TRUE(c.SetPoints(c.GetPoints() + from, c.GetNodeTypes() + from, unsigned(k)));
+        mm.pts = std::vector<T>(mm.pts.begin() + from, mm.pts.begin() + from + k);
+        mm.nodes = std::vector<NODETYPE>(mm.nodes.begin() + from, mm.nodes.begin() + from + k);
+        break;
+      }
+    }
+    for (int k = 0; k < kSlots; ++k) ASSERT_TRUE(Matches(h[k], m[k])) << "step " << step << " op " << op << " slot " << k;
+    for (int k = 0; k < 3; ++k) {
+      ASSERT_TRUE(BytesEqual(pool[k].pts.data(), poolSnap[k].pts.data(), pool[k].pts.size()));
+      ASSERT_EQ(pool[k].nodes, poolSnap[k].nodes);
+    }
+    if (step % 16 == 0) {
+      for (int x = 0; x < kSlots; ++x)
+        for (int y = 0; y < kSlots; ++y) ASSERT_EQ(h[x].Compare(h[y]), ModelCompare(m[x], m[y]));
+    }
+  }
+}
+
+}  // namespace

@@ -52,6 +52,29 @@ void BM_BezierBezierTransversal(benchmark::State& state) {
 }
 BENCHMARK(BM_BezierBezierTransversal);
 
+// Two halves of one curve: they meet only at their smooth joint, the
+// common case of neighbouring segments in a path.
+void BM_BezierBezierSmoothJoint(benchmark::State& state) {
+  const Inputs& in = Data();
+  std::vector<V> halves(8 * 256);
+  for (size_t i = 0; i < 256; ++i) CB::Split(0.5, &in.a[4 * i], &halves[8 * i], &halves[8 * i + 4]);
+  std::vector<double> ta, tb;
+  std::vector<V> pts;
+  ta.reserve(16);
+  tb.reserve(16);
+  pts.reserve(16);
+  size_t i = 0;
+  for (auto _ : state) {
+    ta.clear();
+    tb.clear();
+    pts.clear();
+    CB::FindBezierIntersections(&halves[8 * i], &halves[8 * i + 4], ta, tb, pts);
+    benchmark::DoNotOptimize(ta.data());
+    i = (i + 1) & 255;
+  }
+}
+BENCHMARK(BM_BezierBezierSmoothJoint);
+
 void BM_BezierLine(benchmark::State& state) {
   const Inputs& in = Data();
   std::vector<double> tb, tl;

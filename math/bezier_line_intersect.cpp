@@ -10,6 +10,9 @@
 //     from the line lies on it.
 //   kTangentRel 1e-9: an extreme value of the distance this close to zero
 //     (relative to the magnitude) is a touching root in the wider search.
+//   kMergeWidth 1e-9: a root of the wider search this close to a plain
+//     crossing is that crossing (the two searches run on different
+//     intervals, so the same root may differ in the last digits).
 #include "ostracrv/math/bezier_line_intersect.h"
 
 #include <algorithm>
@@ -30,6 +33,13 @@ constexpr double kWideEndSlack = 1e-6;
 constexpr double kLineSlack = 1e-9;
 constexpr double kAlongUlps = 64.0;
 constexpr double kTangentRel = 1e-9;
+constexpr double kMergeWidth = 1e-9;
+
+// Insertion sort of a handful of values.
+void SortSmall(double* v, int n) noexcept {
+  for (int i = 1; i < n; ++i)
+    for (int j = i; j > 0 && v[j] < v[j - 1]; --j) std::swap(v[j], v[j - 1]);
+}
 
 // The cubic Bernstein function with coefficients e at t (de Casteljau).
 double BernsteinValue(const double* e, double t) noexcept {
@@ -79,7 +89,7 @@ int Roots(const double* e, double endSlack, bool tangential, double tangentTol, 
     for (int i = 0; i < nq; ++i)
       if (q[i] >= 0.0 && q[i] <= 1.0 && std::fabs(BernsteinValue(e, q[i])) <= tangentTol) out[m++] = q[i];
   }
-  std::sort(out, out + m);
+  SortSmall(out, m);
   int w = 0;
   for (int i = 0; i < m; ++i)
     if (w == 0 || out[i] - out[w - 1] > 1e-12) out[w++] = out[i];
@@ -139,7 +149,19 @@ void FindBezierIntersectionsAtX(const V* p, double x, std::vector<double>& ts, b
   const double mag = std::max(Magnitude(q, 4), std::fabs(x));
   if (Along(e, kAlongUlps * kEpsilon * mag)) return;
   double r[5];
-  const int m = tryAgain ? Roots(e, kWideEndSlack, true, kTangentRel * mag, r) : Roots(e, kEndSlack, false, 0.0, r);
+  int m = Roots(e, kEndSlack, false, 0.0, r);
+  if (tryAgain) {
+    // The plain crossings as they are, plus what only the wider search sees.
+    double w[5];
+    const int n = Roots(e, kWideEndSlack, true, kTangentRel * mag, w);
+    const int plain = m;
+    for (int i = 0; i < n && m < 5; ++i) {
+      bool known = false;
+      for (int k = 0; k < plain; ++k) known = known || std::fabs(w[i] - r[k]) <= kMergeWidth;
+      if (!known) r[m++] = w[i];
+    }
+    SortSmall(r, m);
+  }
   ts.insert(ts.end(), r, r + m);
 }
 

@@ -43,6 +43,13 @@ TEST(BezierClosest, GlobalMinimumMatchesDenseReference) {
     EXPECT_NEAR(d, Dist2(At(c, t), target), 1e-9 * (1 + d)) << i;
     EXPECT_LE(d, ref + 1e-10 * (1 + ref)) << i;
     EXPECT_LT(Dist2(p, At(c, t)), 1e-18 * 1e4) << i;
+    // The same far from the origin, to the precision left there.
+    Curve f = c;
+    for (auto& q : f) q = V{q.x - 4e6, q.y + 9e6};
+    double tf = 0, df = kMax;
+    V pf;
+    ASSERT_TRUE(FindClosestPointOnBezier(f.data(), V{target.x - 4e6, target.y + 9e6}, tf, pf, df));
+    EXPECT_NEAR(std::sqrt(df), std::sqrt(d), 1e-7) << i;
   }
 }
 

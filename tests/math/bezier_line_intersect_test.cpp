@@ -106,7 +106,7 @@ TEST(BezierLineIntersect, AtXMatchesBisection) {
     FindBezierIntersectionsAtX(c.data(), x, wide, true);
     for (double t : ts) {
       bool in = false;
-      for (double w : wide) in = in || std::fabs(w - t) < 1e-12;
+      for (double w : wide) in = in || w == t;
       EXPECT_TRUE(in) << i;
     }
     if (ambiguous) continue;

@@ -24,7 +24,12 @@
 //
 // Bounded work: at most 4096 clipping steps and a fixed stack; at most 9
 // results (two cubics that share no stretch meet at most 9 times), plus the
-// shared stretch's ends. Nothing is allocated except the output.
+// shared stretch's ends. A pair that needs many steps (more than 64) is
+// examined for a shared stretch, which allocates three small lists; nothing
+// else is allocated except the output. A pair that exhausts the steps
+// (curves running within about 1e-5 of their size of each other without
+// sharing a stretch) returns what was found by then, in about a
+// millisecond.
 //
 // Coincident curves. Two curves that run along each other (within 1e-10 m)
 // over a stretch are reported by the two ends of the shared stretch: the

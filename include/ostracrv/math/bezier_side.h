@@ -11,10 +11,12 @@
 // vanishes (a handle lying on its end point, a cusp) the first non-vanishing
 // higher derivative with the sign of the direction of travel there.
 //
-// A target within 64 ulps of the curve's coordinate magnitude of the curve
-// is on it: the side is SideNone. Curves are given by their power-basis
-// coefficients a = p3 - 3(p2 - p1) - p0, b = 3(p0 + p2 - 2 p1),
-// c = 3(p1 - p0), d = p0, in doubles for both point kinds.
+// A target closer to the curve than 64 units in the last place of the
+// largest coordinate involved is on it: the side is SideNone.
+//
+// Curves are given by their power-basis coefficients a = p3 - 3(p2 - p1) -
+// p0, b = 3(p0 + p2 - 2 p1), c = 3(p1 - p0), d = p0, in doubles for both
+// point kinds; the control points are recovered from them.
 //
 // Bad input: a non-finite coefficient or target, or a curve whose points all
 // coincide, has no side: the short form answers SideNone, the long form

@@ -2,8 +2,8 @@
 //
 // Constants:
 //   kMergeTolerance 1e-12: stationary points closer than this in t to each
-//     other or to an end are one point; below it the distance cannot change
-//     at double precision.
+//     other or to an end are one point: the roots themselves are only about
+//     that accurate where two of them come close.
 //   Four Newton steps polish a root that root isolation already found to
 //     near full precision in the power basis; a step is kept only if the
 //     distance does not grow.

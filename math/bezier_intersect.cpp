@@ -5,8 +5,9 @@
 //   kLeafWidth 1e-10: parameter width on both curves at which clipping stops
 //     and Newton's method takes over (two steps reach full precision there).
 //   kStallWidth 1e-6: a pair that clipping cannot shrink and that is
-//     narrower than this is solved locally instead of halved further; a
-//     tangency or a shared end point is the only way to get there.
+//     narrower than this is solved locally instead of halved further; only
+//     a tangency, a shared end point or two crossings closer than this get
+//     there.
 //   kMinReduction 0.8: a clip that keeps more than 80 % of both widths has
 //     stalled (the usual criterion of Bezier clipping).
 //   kMergeWidth 1e-6: solutions closer than this in both parameters are one;

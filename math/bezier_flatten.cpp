@@ -134,6 +134,10 @@ int AdaptiveBezierToLines(const T* p, T* out, double tolerance, int maximum) noe
   };
 
   for (int attempt = 0; attempt < 64; ++attempt, tol *= 4.0) {
+    // A piece is only halved when its halves need fewer chords than it, so
+    // the uniform count of the whole curve bounds the result: when that
+    // fits, one pass suffices.
+    if (Steps(q, tol) < double(maximum)) return run(tol, true);
     if (run(tol, false) > 0) return run(tol, true);
   }
   // Unreachable for finite input: a tolerance above the curve's size needs

@@ -84,9 +84,14 @@ Complex Divide(Complex a, Complex b) noexcept {
   const double r = b.re / b.im, d = b.re * r + b.im;
   return {(a.re * r + a.im) / d, (a.im * r - a.re) / d};
 }
+// The operands here are built from coefficients scaled near 1, so plain
+// square roots of sums of squares can neither overflow nor underflow
+// harmfully; hypot's extra care is not needed.
+double Norm(double x, double y) noexcept { return std::sqrt(x * x + y * y); }
+
 // Principal square root, without cancellation in either part.
 Complex Sqrt(Complex z) noexcept {
-  const double m = std::hypot(z.re, z.im);
+  const double m = Norm(z.re, z.im);
   if (m == 0.0) return {0.0, 0.0};
   if (z.re >= 0.0) {
     const double re = std::sqrt(0.5 * (m + z.re));
@@ -96,7 +101,7 @@ Complex Sqrt(Complex z) noexcept {
   return {std::fabs(z.im) / (2.0 * im), std::copysign(im, z.im)};
 }
 bool IsZero(Complex z) noexcept { return z.re == 0.0 && z.im == 0.0; }
-double Abs(Complex z) noexcept { return std::hypot(z.re, z.im); }
+double Abs(Complex z) noexcept { return Norm(z.re, z.im); }
 
 struct Node {
   double x, w;
@@ -196,8 +201,8 @@ class Speed {
     ellipse_ = tables.ellipse[accuracy];
     // Control polygon of the scaled curve: c/3, (b + c)/3, a + (2b + c)/3
     // with the original a, b, c, i.e. C/3, (B/2 + C)/3, A/3 + (B + C)/3.
-    const double polygon = std::hypot(cx_, cy_) / 3.0 + std::hypot(0.5 * bx_ + cx_, 0.5 * by_ + cy_) / 3.0 +
-                           std::hypot(ax_ + bx_ + cx_, ay_ + by_ + cy_) / 3.0;
+    const double polygon =
+        (Norm(cx_, cy_) + Norm(0.5 * bx_ + cx_, 0.5 * by_ + cy_) + Norm(ax_ + bx_ + cx_, ay_ + by_ + cy_)) / 3.0;
     small_ = 0.01 * relative_ * 0.1 * polygon;
     FindRoots();
     return true;

@@ -11,8 +11,9 @@
 // AdaptiveBezierToLines applies the bound piece by piece: a piece that needs
 // k chords is halved when its halves need fewer than k chords together (the
 // bend is concentrated on one side), and is otherwise cut into its k equal
-// steps. Curves with a tight bend get their chords where the bend is, and no
-// curve gets many more chords than the uniform count.
+// steps. Curves with a tight bend get their chords where the bend is, and,
+// by induction over the halving, no curve gets more chords than the uniform
+// count.
 #pragma once
 
 #include "ostracrv/core/common_types.h"

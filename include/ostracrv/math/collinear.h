@@ -23,10 +23,11 @@
 namespace MavikMath {
 
 // True if a, b and c lie within sqrt(threshold) of one line (threshold is a
-// squared distance). False for non-finite points (every comparison fails).
+// squared distance). False for non-finite points.
 template <class T>
 bool AreCollinear(const T& a, const T& b, const T& c, double threshold) noexcept {
   const V pa = ToV(a), pb = ToV(b), pc = ToV(c);
+  if (!pa.IsFinite() || !pb.IsFinite() || !pc.IsFinite()) return false;
   const double ab = SquaredDistance(pa, pb), ac = SquaredDistance(pa, pc), bc = SquaredDistance(pb, pc);
   if (ab < threshold || ac < threshold || bc < threshold) return true;
   V from = pa, to = pb, apex = pc;

@@ -154,8 +154,8 @@ constexpr double kMargin = 1.0;
 
 int FirstRule(int accuracy) noexcept { return accuracy > 3 ? 1 : 0; }
 
-// Per accuracy k: the relative tolerance 10^-k and the ellipse sum
-// rho + 1/rho with rho = 10^((k + 2) / (2n)).
+// Per accuracy k: the relative tolerance 10^-k and, for each rule of the
+// family, the ellipse sum rho + 1/rho with rho = 10^((k + 1) / (2n)).
 struct Tables {
   double relative[kLengthFinest + 1];
   double ellipse[kLengthFinest + 1][kRulesPerFamily];

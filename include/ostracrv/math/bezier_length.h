@@ -47,8 +47,9 @@ namespace MavikMath::CubicBezier {
 
 // Arc length over [0, 1] from the power-basis coefficients of the curve.
 // Returns 0 for a curve that is one point and for non-finite coefficients.
-// Cost: O(1) for ordinary curves; each refinement level adds two rule
-// evaluations.
+// Cost: one panel of 8 to 32 speed evaluations for an ordinary curve; a
+// near-cusp adds about two panels per halving of its distance from the
+// real axis (a few dozen panels at most).
 double Length(const V& a, const V& b, const V& c, LengthAccuracy accuracy = kLengthPrecise) noexcept;
 
 // Arc length over [t0, t1] (clamped to [0, 1]); 0 when t1 <= t0 or for

@@ -1,19 +1,27 @@
 // OstraCrv: two-dimensional curve geometry. This umbrella header pulls in the
 // whole public interface.
 #pragma once
-
 #include "ostracrv/core/common_types.h"
 #include "ostracrv/core/curvedata.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/core/polycurve.h"
+#include "ostracrv/math/angles.h"
+#include "ostracrv/math/bezier_area.h"
 #include "ostracrv/math/bezier_basis.h"
 #include "ostracrv/math/bezier_closest.h"
+#include "ostracrv/math/bezier_derivatives.h"
+#include "ostracrv/math/bezier_flatten.h"
 #include "ostracrv/math/bezier_intersect.h"
+#include "ostracrv/math/bezier_length.h"
 #include "ostracrv/math/bezier_line_intersect.h"
+#include "ostracrv/math/bezier_map.h"
 #include "ostracrv/math/bezier_self_intersect.h"
 #include "ostracrv/math/bezier_side.h"
 #include "ostracrv/math/bezier_split.h"
+#include "ostracrv/math/collinear.h"
+#include "ostracrv/math/line_rect.h"
+#include "ostracrv/math/linear_solvers.h"
 #include "ostracrv/math/matrix.h"
 #include "ostracrv/math/polynomial.h"
 #include "ostracrv/math/rect.h"

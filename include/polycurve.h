@@ -1,6 +1,7 @@
 // OstraCrv: two-dimensional curve geometry. This umbrella header pulls in the
 // whole public interface.
 #pragma once
+
 #include "ostracrv/core/common_types.h"
 #include "ostracrv/core/curvedata.h"
 #include "ostracrv/core/mavikutils.h"

@@ -226,8 +226,8 @@ bool DampedStep(Sample* s, int m, const Problem& p, double& alpha, double& beta,
   return false;
 }
 
-// Chord-length parameters of the samples; uniform if they all coincide.
-// q holds all count samples; u receives count parameters.
+// Chord-length parameters of the count samples point(0..count-1), into u;
+// uniform if the samples all coincide.
 template <class Get>
 void ChordParameters(int count, Get point, double* u) noexcept {
   u[0] = 0.0;

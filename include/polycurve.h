@@ -4,6 +4,8 @@
 
 #include "ostracrv/core/common_types.h"
 #include "ostracrv/core/curvedata.h"
+#include "ostracrv/core/curveposition.h"
+#include "ostracrv/core/curvesegment.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/core/polycurve.h"

@@ -104,9 +104,12 @@ unsigned long CurveSegmentT<T>::prev_number() const noexcept {
   NODETYPE const before = nodes_.size() > 1 ? nodes_[0] : *(nodes_.data() - 1);
   switch (GetSegmentType(before)) {
     case SegmentType::move:
-    case SegmentType::line: return number_ - 1;
-    case SegmentType::curve: return number_ >= 3 ? number_ - 3 : 0;
-    case SegmentType::arc: break;
+    case SegmentType::line:
+      return number_ - 1;
+    case SegmentType::curve:
+      return number_ >= 3 ? number_ - 3 : 0;
+    case SegmentType::arc:
+      break;
   }
   return 0;
 }
@@ -153,8 +156,8 @@ typename details<T>::range details<T>::GetCurveSegments_Base(PolycurveT<T> curve
 }
 
 template <class T>
-typename details<T>::range details<T>::GetCurveSegments_Range(PolycurveT<T> curve,
-                                                              MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>> r) {
+typename details<T>::range details<T>::GetCurveSegments_Range(
+    PolycurveT<T> curve, MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>> r) {
   auto keep = std::make_shared<const PolycurveT<T>>(curve);
   // A range that ends beyond the curve is clipped, so no view reads past it.
   const unsigned long end = std::min((*r.end()), keep->GetPointCount());
@@ -162,8 +165,8 @@ typename details<T>::range details<T>::GetCurveSegments_Range(PolycurveT<T> curv
 }
 
 template <class T>
-typename details<T>::range details<T>::GetCurveSegments_Raw(NODETYPE const* nodes, T const* points,
-                                                            MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>> r) {
+typename details<T>::range details<T>::GetCurveSegments_Raw(
+    NODETYPE const* nodes, T const* points, MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>> r) {
   return MakeRange<T>(nodes, points, *r.begin(), *r.end(), nullptr);
 }
 
@@ -216,11 +219,11 @@ bool ValidSegments(PolycurveT<T> const& curve, MavikUtils::RangeView<MavikUtils:
 }
 
 #define OSTRACRV_INSTANTIATE_SEGMENT_VIEWS(T)                                                                       \
-  template class CurveSegmentT<T>;                                                                                \
-  template struct details<T>;                                                                                     \
-  template MavikUtils::optional<CurveSegmentT<T>> GetCurveSegment<T>(unsigned long, NODETYPE const*, T const*,     \
+  template class CurveSegmentT<T>;                                                                                  \
+  template struct details<T>;                                                                                       \
+  template MavikUtils::optional<CurveSegmentT<T>> GetCurveSegment<T>(unsigned long, NODETYPE const*, T const*,      \
                                                                      MavikUtils::optional<unsigned long>) noexcept; \
-  template bool ValidSegments<T>(PolycurveT<T> const&);                                                           \
+  template bool ValidSegments<T>(PolycurveT<T> const&);                                                             \
   template bool ValidSegments<T>(PolycurveT<T> const&, MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>>);
 
 OSTRACRV_INSTANTIATE_SEGMENT_VIEWS(POINT)

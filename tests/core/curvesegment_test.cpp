@@ -86,23 +86,23 @@ TYPED_TEST(SegmentViews, NumbersThatNameNoPieceAreAbsent) {
   PolycurveT<T> c(pts.data(), kSmall.data(), kSmall.size());
   const auto* n = kSmall.data();
   const auto* p = pts.data();
-  EXPECT_FALSE(GetCurveSegment<T>(4, n, p, 5ul));              // a curve node
-  EXPECT_FALSE(GetCurveSegment<T>(3, n, p, 5ul));              // the second arc
-  EXPECT_FALSE(GetCurveSegment<T>(2, n, p, 4ul));              // Bezier cut by the count
-  EXPECT_FALSE(GetCurveSegment<T>(5, n, p, 5ul));              // out of range
-  EXPECT_FALSE(GetCurveSegment<T>(1, n, nullptr, 5ul));        // null arrays
+  EXPECT_FALSE(GetCurveSegment<T>(4, n, p, 5ul));        // a curve node
+  EXPECT_FALSE(GetCurveSegment<T>(3, n, p, 5ul));        // the second arc
+  EXPECT_FALSE(GetCurveSegment<T>(2, n, p, 4ul));        // Bezier cut by the count
+  EXPECT_FALSE(GetCurveSegment<T>(5, n, p, 5ul));        // out of range
+  EXPECT_FALSE(GetCurveSegment<T>(1, n, nullptr, 5ul));  // null arrays
   EXPECT_FALSE(GetCurveSegment<T>(1, nullptr, p, 5ul));
   EXPECT_TRUE(GetCurveSegment<T>(2, n, p, MavikUtils::nullopt));
   const NODETYPE lineFirst[] = {0x44, 0x44};
-  EXPECT_FALSE(GetCurveSegment<T>(0, lineFirst, p, 2ul));      // a line with no start
+  EXPECT_FALSE(GetCurveSegment<T>(0, lineFirst, p, 2ul));  // a line with no start
   const NODETYPE arcFirst[] = {0xC0, 0xC0, 0x84};
   EXPECT_FALSE(GetCurveSegment<T>(0, arcFirst, p, 3ul));
 
-  EXPECT_FALSE(CurveSegmentT<T>::FromEndIdx(c, 3));            // an arc ends nothing
+  EXPECT_FALSE(CurveSegmentT<T>::FromEndIdx(c, 3));  // an arc ends nothing
   EXPECT_FALSE(CurveSegmentT<T>::FromEndIdx(c, 5));
   EXPECT_FALSE(CurveSegmentT<T>::FromEndIdx(c, ~0ul));
   EXPECT_FALSE(CurveSegmentT<T>::FromStartIdx(c, 4));
-  EXPECT_FALSE(CurveSegmentT<T>::FromStartIdx(c, ~0ul));       // i+1 wraps to 0
+  EXPECT_FALSE(CurveSegmentT<T>::FromStartIdx(c, ~0ul));  // i+1 wraps to 0
   EXPECT_FALSE(CurveSegmentT<T>::FromNumber(c, 4));
 
   // The constructors give invalid views where the function gives none.
@@ -180,8 +180,8 @@ TYPED_TEST(SegmentViews, WalkMatchesConstructionOfRandomPaths) {
     // A range over one subpath, without its move view, gives its segments.
     const auto& sp = path.subpaths[rng() % path.subpaths.size()];
     size_t segs = 0;
-    for (const auto& v : MavikUtils::skip_first(details<T>::GetCurveSegments_Range(
-             c, MavikUtils::Indices(unsigned(sp.first), unsigned(sp.last + 1))))) {
+    for (const auto& v : MavikUtils::skip_first(
+             details<T>::GetCurveSegments_Range(c, MavikUtils::Indices(unsigned(sp.first), unsigned(sp.last + 1))))) {
       EXPECT_NE(v.type(), 1);
       EXPECT_LE(v.endIndex(), unsigned(sp.last));
       ++segs;
@@ -238,18 +238,18 @@ TYPED_TEST(SegmentViews, ValidSegmentsRefusesBrokenShapes) {
   EXPECT_TRUE(OstraCrv::ValidSegments(PolycurveT<T>()));
   EXPECT_TRUE(check(kSmall));
   EXPECT_TRUE(check({0x04}));
-  EXPECT_FALSE(check({0x04, 0x44, 0xC0}));              // ends in an arc
-  EXPECT_FALSE(check({0x04, 0x44, 0xC0, 0xC0}));        // Bezier without its end
-  EXPECT_FALSE(check({0x04, 0xC0, 0x84}));              // one arc only
-  EXPECT_FALSE(check({0x04, 0x84}));                    // curve without arcs
-  EXPECT_FALSE(check({0x44, 0x44}));                    // no start
+  EXPECT_FALSE(check({0x04, 0x44, 0xC0}));        // ends in an arc
+  EXPECT_FALSE(check({0x04, 0x44, 0xC0, 0xC0}));  // Bezier without its end
+  EXPECT_FALSE(check({0x04, 0xC0, 0x84}));        // one arc only
+  EXPECT_FALSE(check({0x04, 0x84}));              // curve without arcs
+  EXPECT_FALSE(check({0x44, 0x44}));              // no start
 
   std::vector<T> pts(kSmall.size());
   PolycurveT<T> c(pts.data(), kSmall.data(), kSmall.size());
   EXPECT_TRUE(OstraCrv::ValidSegments(c, MavikUtils::Indices(1, 5)));
-  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(1, 4)));   // cuts the Bezier
-  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(0, 6)));   // beyond the curve
-  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(3, 5)));   // starts on an arc
+  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(1, 4)));  // cuts the Bezier
+  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(0, 6)));  // beyond the curve
+  EXPECT_FALSE(OstraCrv::ValidSegments(c, MavikUtils::Indices(3, 5)));  // starts on an arc
 }
 
 TYPED_TEST(SegmentViews, StepFunctionsFollowTheNodeKinds) {

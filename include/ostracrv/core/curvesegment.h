@@ -81,19 +81,21 @@ class CurveSegmentT {
   // By the number of entries: 1 move, 2 line, 4 curve, anything else none.
   int type() const noexcept {
     switch (nodes_.size()) {
-      case 1: return kMove;
-      case 2: return kLine;
-      case 4: return kCurve;
-      default: return kNone;
+      case 1:
+        return kMove;
+      case 2:
+        return kLine;
+      case 4:
+        return kCurve;
+      default:
+        return kNone;
     }
   }
   unsigned long number() const noexcept { return number_; }
   // Index of the first entry: number for a move view, number-1 otherwise.
   unsigned long startIndex() const noexcept { return nodes_.size() > 1 ? number_ - 1 : number_; }
   // Index of the last entry.
-  unsigned long endIndex() const noexcept {
-    return points_.empty() ? startIndex() : startIndex() + points_.size() - 1;
-  }
+  unsigned long endIndex() const noexcept { return points_.empty() ? startIndex() : startIndex() + points_.size() - 1; }
   // The last node, the one that carries the segment's type; a move byte (0)
   // for an invalid view.
   NODETYPE node() const noexcept { return nodes_.empty() ? NODETYPE(0) : nodes_.back(); }
@@ -186,8 +188,7 @@ struct CurveSegmentGetter {
   CurveSegmentGetter() = default;
   CurveSegmentGetter(NODETYPE const* n, T const* p, unsigned long c) : nodes(n), points(p), count(c) {}
   // Over the curve's arrays; the count falls back on GetPointCount().
-  explicit CurveSegmentGetter(PolycurveT<T> const& curve,
-                              MavikUtils::optional<unsigned long> c = MavikUtils::nullopt)
+  explicit CurveSegmentGetter(PolycurveT<T> const& curve, MavikUtils::optional<unsigned long> c = MavikUtils::nullopt)
       : nodes(curve.GetNodeTypes()), points(curve.GetPoints()), count(c ? *c : curve.GetPointCount()) {}
 
   MavikUtils::optional<CurveSegmentT<T>> operator()(unsigned long number) const noexcept {
@@ -211,9 +212,12 @@ struct NextCurveSegment {
   static unsigned long Step(NODETYPE node, unsigned long number) noexcept {
     switch (GetSegmentType(node)) {
       case SegmentType::move:
-      case SegmentType::line: return number + 1;
-      case SegmentType::arc: return number + 3;
-      case SegmentType::curve: break;
+      case SegmentType::line:
+        return number + 1;
+      case SegmentType::arc:
+        return number + 3;
+      case SegmentType::curve:
+        break;
     }
     return 1;
   }

@@ -32,6 +32,7 @@
 #include "ostracrv/math/vector2d.h"
 #include "ostracrv/measure/area.h"
 #include "ostracrv/measure/bounds.h"
+#include "ostracrv/measure/closest.h"
 #include "ostracrv/measure/farthest.h"
 #include "ostracrv/measure/length.h"
 #include "ostracrv/measure/pointoncurve.h"

@@ -7,6 +7,7 @@
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/core/polycurve.h"
+#include "ostracrv/io/svg_path.h"
 #include "ostracrv/math/bezier_basis.h"
 #include "ostracrv/math/bezier_split.h"
 #include "ostracrv/math/matrix.h"

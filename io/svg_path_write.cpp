@@ -88,6 +88,7 @@ class PathWriter {
   int precision_;
   bool relative_;
   std::string out_;
+  std::vector<std::string> abs_, rel_;
   char lastLetter_ = 0;       // letter whose repetition may be left out
   bool lastHasDotOrExp_ = false;
   bool lastWasLetter_ = false;
@@ -156,7 +157,12 @@ class PathWriter {
 std::string PathWriter::Write(V const* pts, NODETYPE const* nodes, int n) {
   for (int i = 0; i < n; ++i) {
     const NODETYPE node = nodes[i];
-    std::vector<std::string> abs, rel;
+    // Token lists reused from command to command; the tokens are short
+    // enough for the strings' own buffers, so nothing is allocated per node.
+    std::vector<std::string>& abs = abs_;
+    std::vector<std::string>& rel = rel_;
+    abs.clear();
+    rel.clear();
     bool relOk = true;
     if (IsMove(node)) {
       const V p = Target(pts[i]);

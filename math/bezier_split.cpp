@@ -91,6 +91,15 @@ template <class T>
 void Subsection(double t0, double t1, const T* p, T* out) noexcept {
   V in[4], a[7], b[7];
   Load(p, in);
+  if (t1 < t0) {
+    // The backward piece is the forward piece reversed; cutting it directly
+    // would extrapolate the short right part far outside its own range.
+    V o[4];
+    Subsection(t1, t0, in, o);
+    const V r[4] = {o[3], o[2], o[1], o[0]};
+    Store(r, out, 4);
+    return;
+  }
   if (t0 == 0.0) {
     SplitD(t1, in, a);
     Store(a, out, 4);

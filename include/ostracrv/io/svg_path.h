@@ -54,7 +54,8 @@ namespace OstraCrv {
 
 // Where and why path data stopped being readable. offset is the byte offset
 // of the offending character in the data (its size when the data ended too
-// early); reason is a short static English text, null when there was no error.
+// early; the start of the argument group for a coordinate that overflows);
+// reason is a short static English text, null when there was no error.
 struct SvgPathError {
   std::size_t offset = 0;
   const char* reason = nullptr;

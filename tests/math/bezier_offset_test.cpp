@@ -1,0 +1,245 @@
+#include "ostracrv/math/bezier_offset.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cmath>
+#include <limits>
+#include <random>
+#include <vector>
+
+#include "math/fit_reference.h"
+#include "ostracrv/math/bezier_split.h"
+
+using namespace MavikMath;
+using Bez = CubicBezier::bezier2dT<V>;
+
+namespace {
+
+// The offset as defined: B(t) + d n(t), n the unit left normal of B'.
+V TrueOffset(const V* p, double d, double t) {
+  const D n = fitref::Deriv(p, t).Normalized().Perpendicular();
+  return fitref::Point(p, t) + n * d;
+}
+
+Bez RandomCubic(std::mt19937& rng, double size) {
+  std::uniform_real_distribution<double> u(-size, size);
+  return Bez{{{u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}}};
+}
+
+// The callers' recursion: split where the library says, until it accepts.
+struct Accepted {
+  Bez source, result;
+};
+int OffsetRecursively(const Bez& b, double d, double tol, int depth, std::vector<Accepted>& out) {
+  V r[4];
+  double s = -1.0;
+  if (FindBezierOffsetCurve(b.data(), r, d, tol * tol, s)) {
+    out.push_back({b, Bez{{r[0], r[1], r[2], r[3]}}});
+    return depth;
+  }
+  if (!(s > 0.0 && s < 1.0) || depth > 40) return 1000;  // gave up: not expected here
+  Bez left, right;
+  CubicBezier::Split(s, b.data(), left.data(), right.data());
+  return std::max(OffsetRecursively(left, d, tol, depth + 1, out), OffsetRecursively(right, d, tol, depth + 1, out));
+}
+
+// Worst squared distance from the densely sampled true offset to the result.
+double WorstDeviationSq(const Accepted& a, double d, int n = 300) {
+  double worst = 0;
+  for (int i = 0; i <= n; ++i)
+    worst = std::max(worst, fitref::DistanceSq([&](double t) { return fitref::Point(a.result.data(), t); },
+                                               TrueOffset(a.source.data(), d, double(i) / n), n + 100));
+  return worst;
+}
+
+bool Near(const std::vector<double>& set, double t, double eps) {
+  for (double x : set)
+    if (std::fabs(x - t) < eps) return true;
+  return false;
+}
+
+}  // namespace
+
+TEST(FindBezierOffsetCurve, AcceptedCurvesStayWithinToleranceOfTheTrueOffset) {
+  std::mt19937 rng(17);
+  std::uniform_real_distribution<double> u(0, 1);
+  int accepted = 0;
+  for (int trial = 0; trial < 120; ++trial) {
+    const Bez b = RandomCubic(rng, 100);
+    const double d = (2 * u(rng) - 1) * 60, tol = 0.01 + 2 * u(rng);
+    std::vector<Bez> pieces;
+    GetSegmentsToOffset(b, pieces, d, nullptr);
+    for (const Bez& piece : pieces) {
+      EXPECT_TRUE(IsBezierValidForOffset(piece.data(), d));
+      std::vector<Accepted> out;
+      ASSERT_LE(OffsetRecursively(piece, d, tol, 0, out), 40) << "trial " << trial;
+      for (const Accepted& a : out) {
+        ++accepted;
+        ASSERT_LT(WorstDeviationSq(a, d), tol * tol) << "trial " << trial;
+        // Ends are the exact offsets of the ends; end tangents parallel.
+        EXPECT_LT(Distance(a.result[0], TrueOffset(a.source.data(), d, 0)), 1e-9 * (100 + std::fabs(d)));
+        EXPECT_LT(Distance(a.result[3], TrueOffset(a.source.data(), d, 1)), 1e-9 * (100 + std::fabs(d)));
+      }
+    }
+  }
+  EXPECT_GT(accepted, 200);
+}
+
+TEST(FindBezierOffsetCurve, TightBendFarInsideTheDistance) {
+  // A hairpin 0.04 wide whose turn happens in a sliver of its parameter: on
+  // the outer side the offset swings half a circle of radius 44 there, which
+  // evenly spaced samples in t would step over.
+  const Bez bend{{{-4.3584326287305579, -1.1041730994096564}, {-4.3295650352003232, -1.1101970363735836},
+                  {-4.3174376164979718, -1.1128485977358706}, {-4.3214877059558532, -1.1121234489850718}}};
+  const double d = -44.2134, tol = 1.89341;
+  std::vector<Accepted> out;
+  ASSERT_LE(OffsetRecursively(bend, d, tol, 0, out), 40);
+  for (const Accepted& a : out) EXPECT_LT(WorstDeviationSq(a, d, 2000), tol * tol);
+}
+
+TEST(FindBezierOffsetCurve, SignConventionAndConcentricArcs) {
+  // Positive distances lie on the left of the direction of travel (y up).
+  const V line[4] = {{0, 0}, {10, 0}, {20, 0}, {30, 0}};
+  V r[4];
+  double s = -1.0;
+  ASSERT_TRUE(FindBezierOffsetCurve(line, r, 2.0, 1e-6, s));
+  for (const V& q : r) EXPECT_NEAR(q.y, 2.0, 1e-9);
+  // A counter-clockwise quarter circle of radius 100 around the origin: the
+  // offset of d lies on the circle of radius 100 - d, and beyond the centre
+  // (d = 150) it runs backwards on radius 50.
+  const double k = 0.5522847498 * 100;
+  const V arc[4] = {{100, 0}, {100, k}, {k, 100}, {0, 100}};
+  for (double d : {30.0, -30.0, 150.0}) {
+    s = -1.0;
+    ASSERT_TRUE(FindBezierOffsetCurve(arc, r, d, 0.25, s)) << d;
+    for (int i = 0; i <= 50; ++i) EXPECT_NEAR(fitref::Point(r, i / 50.0).Length(), std::fabs(100 - d), 0.5 + 0.03);
+    // Beyond the centre the offset runs against the curve.
+    EXPECT_EQ(Dot(r[1] - r[0], arc[1] - arc[0]) > 0, d < 100) << d;
+  }
+  // Distance 0 is the curve itself.
+  ASSERT_TRUE(FindBezierOffsetCurve(arc, r, 0.0, 1e-6, s));
+  for (int i = 0; i < 4; ++i) EXPECT_EQ(r[i], arc[i]);
+}
+
+TEST(GetSegmentsToOffset, CutsAtInflectionsAndWhereTheRadiusEqualsTheDistance) {
+  // Also: the whole curve is valid for offset exactly when its offset has no
+  // fold inside.
+  std::mt19937 rng(23);
+  std::uniform_real_distribution<double> u(0, 1);
+  int cuts = 0;
+  for (int trial = 0; trial < 250; ++trial) {
+    const Bez b = RandomCubic(rng, 100);
+    const double d = (2 * u(rng) - 1) * 80;
+    const V* p = b.data();
+    // References: sign changes of cross(B', B'') and of 1 - d kappa.
+    std::vector<double> ref = fitref::SignChanges([&](double t) { return Cross(fitref::Deriv(p, t), fitref::Deriv2(p, t)); });
+    const std::vector<double> folds = fitref::SignChanges([&](double t) { return 1 - d * fitref::Curvature(p, t); });
+    ref.insert(ref.end(), folds.begin(), folds.end());
+    EXPECT_EQ(IsBezierValidForOffset(p, d), folds.empty()) << "trial " << trial;
+    std::vector<Bez> pieces;
+    std::vector<double> params = {-5.0};  // appended to, not cleared
+    GetSegmentsToOffset(b, pieces, d, &params);
+    ASSERT_EQ(params.front(), -5.0);
+    params.erase(params.begin());
+    ASSERT_EQ(pieces.size(), params.size() + 1);
+    cuts += int(params.size());
+    for (double t : ref) EXPECT_TRUE(Near(params, t, 1e-7)) << "missed cut " << t << " trial " << trial;
+    for (double t : params) {
+      EXPECT_TRUE(t > 0 && t < 1);
+      EXPECT_TRUE(Near(ref, t, 1e-7)) << "extra cut " << t << " trial " << trial;
+    }
+    // The pieces are the curve between the cuts, joined bit for bit.
+    EXPECT_EQ(pieces.front()[0], b[0]);
+    EXPECT_EQ(pieces.back()[3], b[3]);
+    for (size_t i = 0; i < pieces.size(); ++i) {
+      const double t0 = i == 0 ? 0 : params[i - 1], t1 = i == params.size() ? 1 : params[i];
+      if (i + 1 < pieces.size()) {
+        EXPECT_EQ(pieces[i][3], pieces[i + 1][0]);
+      }
+      EXPECT_LT(Distance(fitref::Point(pieces[i].data(), 0.3), fitref::Point(p, t0 + 0.3 * (t1 - t0))), 1e-9 * 100);
+    }
+  }
+  EXPECT_GT(cuts, 250);
+}
+
+TEST(GetSegmentsToOffset, CutsAtCuspsAndStraightTurnarounds) {
+  std::mt19937 rng(4);
+  std::uniform_real_distribution<double> u(-50, 50);
+  for (int trial = 0; trial < 50; ++trial) {
+    // Build B' = 3a t^2 + 2b t + c with B'(t0) = 0.
+    const double t0 = 0.2 + 0.6 * (u(rng) + 50) / 100;
+    const D a{u(rng), u(rng)}, bb{u(rng), u(rng)};
+    const D c = a * (-3 * t0 * t0) - bb * (2 * t0);
+    V p[4];
+    p[0] = V{u(rng), u(rng)};
+    p[1] = p[0] + c / 3.0;
+    p[2] = V{bb.x / 3 - p[0].x + 2 * p[1].x, bb.y / 3 - p[0].y + 2 * p[1].y};
+    p[3] = V{a.x + 3 * p[2].x - 3 * p[1].x + p[0].x, a.y + 3 * p[2].y - 3 * p[1].y + p[0].y};
+    for (double d : {0.0, 7.0}) {
+      std::vector<Bez> pieces;
+      std::vector<double> params;
+      GetSegmentsToOffset(Bez{{p[0], p[1], p[2], p[3]}}, pieces, d, &params);
+      EXPECT_TRUE(Near(params, t0, 1e-6)) << "trial " << trial;
+      EXPECT_FALSE(IsBezierValidForOffset(p, d));
+      for (const Bez& piece : pieces) EXPECT_TRUE(IsBezierValidForOffset(piece.data(), d));
+    }
+  }
+  // A straight Bezier that runs back: cut where x' = 0; each piece offsets to
+  // the left of its own direction of travel.
+  const Bez back{{{0, 0}, {30, 0}, {-10, 0}, {20, 0}}};
+  std::vector<Bez> pieces;
+  std::vector<double> params;
+  GetSegmentsToOffset(back, pieces, 5.0, &params);
+  // x'(t)/3 = 30 (1-t)^2 - 80 (1-t) t + 30 t^2 = 140 t^2 - 140 t + 30.
+  const double r = std::sqrt(140.0 * 140 - 4 * 140 * 30) / 280;
+  ASSERT_EQ(params.size(), 2u);
+  EXPECT_NEAR(params[0], 0.5 - r, 1e-9);
+  EXPECT_NEAR(params[1], 0.5 + r, 1e-9);
+  for (const Bez& piece : pieces) {
+    V res[4];
+    double s = -1.0;
+    ASSERT_TRUE(FindBezierOffsetCurve(piece.data(), res, 5.0, 1e-4, s));
+    const double expected = piece[3].x > piece[0].x ? 5.0 : -5.0;
+    for (const V& q : res) EXPECT_NEAR(q.y, expected, 1e-6);
+  }
+}
+
+TEST(BezierOffset, BadInputGivesNoResult) {
+  const double nan = std::nan(""), inf = std::numeric_limits<double>::infinity();
+  const V good[4] = {{0, 0}, {10, 10}, {20, 10}, {30, 0}}, sentinel{-3, -3};
+  const V bad[3][4] = {{{0, 0}, {nan, 10}, {20, 10}, {30, 0}},
+                       {{0, 0}, {10, 10}, {20, inf}, {30, 0}},
+                       {{5, 5}, {5, 5}, {5, 5}, {5, 5}}};  // a dot
+  auto expectNothing = [&](const V* p, double d, double tol2) {
+    V r[4] = {sentinel, sentinel, sentinel, sentinel};
+    double s = -1.0;
+    EXPECT_FALSE(FindBezierOffsetCurve(p, r, d, tol2, s));
+    EXPECT_EQ(s, -1.0);
+    for (const V& q : r) EXPECT_EQ(q, sentinel);
+    EXPECT_FALSE(p && tol2 > 0 && IsBezierValidForOffset(p, d));
+  };
+  for (const auto& p : bad) {
+    expectNothing(p, 3.0, 0.01);
+    std::vector<Bez> pieces(1);
+    std::vector<double> params(2, 0.5);
+    GetSegmentsToOffset(Bez{{p[0], p[1], p[2], p[3]}}, pieces, 3.0, &params);
+    EXPECT_EQ(pieces.size(), 1u);
+    EXPECT_EQ(params.size(), 2u);
+  }
+  for (double d : {nan, inf}) expectNothing(good, d, 0.01);
+  for (double tol2 : {0.0, -1.0, nan}) expectNothing(good, 3.0, tol2);
+  expectNothing(nullptr, 3.0, 0.01);
+  double s = -1.0;
+  EXPECT_FALSE(FindBezierOffsetCurve(good, nullptr, 3.0, 0.01, s));
+  EXPECT_FALSE(IsBezierValidForOffset(nullptr, 3.0));
+}
+
+TEST(FindBezierOffsetCurve, UnreachableToleranceFarFromTheOriginStillEnds) {
+  // Rounding of coordinates near 1e9 is ~1e-7: a tolerance of 1e-9 cannot be
+  // met and is raised to the noise floor instead of splitting forever.
+  const V far[4] = {{1e9, 1e9}, {1e9 + 40, 1e9 + 90}, {1e9 + 120, 1e9 + 60}, {1e9 + 100, 1e9}};
+  std::vector<Accepted> out;
+  EXPECT_LE(OffsetRecursively(Bez{{far[0], far[1], far[2], far[3]}}, 10.0, 1e-9, 0, out), 40);
+  EXPECT_FALSE(out.empty());
+}

@@ -65,7 +65,11 @@ bool Filled(int count, bool nonZero) { return nonZero ? count != 0 : (count & 1)
 
 WeldStateData::WeldStateData(PolycurveT<V> const& firstIn, bool firstNonZeroIn, PolycurveT<V> const& secondIn,
                              bool secondNonZeroIn, bool includeOpen, bool alwaysFillSides, WeldFlags flagsIn)
-    : first(firstIn), second(secondIn), firstNonZero(firstNonZeroIn), secondNonZero(secondNonZeroIn), flags(flagsIn) {
+    : first(CleanWeldOperand(firstIn)),
+      second(CleanWeldOperand(secondIn)),
+      firstNonZero(firstNonZeroIn),
+      secondNonZero(secondNonZeroIn),
+      flags(flagsIn) {
   const bool precise = HasWeldFlag(flags, WeldFlags::Precise);
   tolerance = precise ? kPreciseWeldTolerance : kWeldTolerance;
   angleTolerance = precise ? kPreciseAngleTolerance : kWeldAngleTolerance;
@@ -97,6 +101,8 @@ WeldStateData::WeldStateData(PolycurveT<V> const& firstIn, bool firstNonZeroIn, 
   MavikMath::InflateRect(firstBounds, kBoundsMargin, kBoundsMargin);
   MavikMath::InflateRect(secondBounds, kBoundsMargin, kBoundsMargin);
 
+  curveBoxes_.reserve(curves.size());
+  for (WeldCurve const& c : curves) curveBoxes_.push_back(MavikMath::GetPointsBBox(c.points, c.count));
   segments = std::make_unique<WeldSegments>(curves, WeldGraphIntersectionSettings(tolerance));
   for (SegmentIntersections const& s : segments->segments) {
     edgeTotal += int(s.intersections.size()) + 1;
@@ -114,12 +120,20 @@ bool WeldStateData::IsOpenCurve(int c) const noexcept {
 
 std::vector<WeldCurve> WeldStateData::ProbeCurves(V const* points, NODETYPE const* nodes, int count,
                                                   bool ownFirst) const {
+  // Only curves whose box meets the probe's can meet it: the engine tests
+  // every pair of segments by their boxes first, inflated by the tolerance,
+  // so leaving the others out changes no record and saves a pass over all
+  // their segments per probe.
+  MavikMath::BoundsT<double> box;
+  for (int i = 0; i < count; ++i) box.Add(points[i]);
+  MavikMath::InflateRect(box, 4.0 * tolerance, 4.0 * tolerance);
   std::vector<WeldCurve> list;
   const size_t from = ownFirst ? 0 : size_t(firstCurveCount);
   const size_t to = ownFirst ? size_t(firstCurveCount) : curves.size();
-  list.reserve(1 + to - from);
   list.emplace_back(points, nodes, count, true, true);
-  for (size_t i = from; i < to; ++i) list.emplace_back(curves[i].points, curves[i].nodes, curves[i].count, false, true);
+  for (size_t i = from; i < to; ++i)
+    if (MavikMath::DoRectsOverlap(curveBoxes_[i], box))
+      list.emplace_back(curves[i].points, curves[i].nodes, curves[i].count, false, true);
   return list;
 }
 
@@ -167,10 +181,11 @@ void WeldStateData::PopulateFilledSides() {
       std::vector<Edge> candidates = SafeEdges(first, SharedWith::OwnOperand, kSeedCandidates);
       if (candidates.empty()) candidates = SafeEdges(first, SharedWith::Nothing, kSeedCandidates);
       Edge seed;
-      bool clean = false;
-      for (Edge const& c : candidates) {
+      for (ProbePlace const& place : kProbePlan) {
+        if (place.candidate >= candidates.size()) continue;
+        Edge const& c = candidates[place.candidate];
         int l = 0, r = 0;
-        clean = SeedSides(c, ownFirst, l, r);
+        const bool clean = SeedSides(c, place.fraction, ownFirst, l, r);
         if (!seed.valid() || clean) {
           seed = c;
           left = l;
@@ -196,7 +211,16 @@ void WeldStateData::PopulateFilledSides() {
       Edge e = first;
       while (e.valid() && e.isZeroLength() && guard-- > 0) e = e.nextEdge();
       if (!e.valid()) continue;
-      SeedSides(e, ownFirst, left, right);
+      for (ProbePlace const& place : kProbePlan) {
+        if (place.candidate != 0) continue;
+        int l = 0, r = 0;
+        const bool clean = SeedSides(e, place.fraction, ownFirst, l, r);
+        if (place.fraction == 0.5 || clean) {
+          left = l;
+          right = r;
+        }
+        if (clean) break;
+      }
       store(e, left, right, rule);
       for (e = e.nextEdge(); e.valid() && guard-- > 0; e = e.nextEdge()) {
         pass(e.start, ownFirst, left, right);
@@ -206,59 +230,44 @@ void WeldStateData::PopulateFilledSides() {
   }
 }
 
-bool WeldStateData::SeedSides(Edge const& cur, bool ownFirst, int& left, int& right) const {
+bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, int& left, int& right) const {
   left = right = 0;
   const SegmentView v = ViewOf(*segments, *cur.segment);
   if (!v.points) return false;
   const WeldCurve& wc = curves[size_t(cur.curve())];
-  // The edge's own segment in the probe's engine (the probe's two segments
-  // come first, then the operand's).
-  const int ownIndex = 2 + cur.segment->index - (ownFirst ? 0 : firstSegmentCount_);
-  // Cast along the normal; a probe that meets another curve within the
-  // tolerance of the edge, or a node of the operand within the tolerance of
-  // the probe (a crossing that may be counted twice), is cast again
-  // through another place of the edge.
-  bool first = true;
-  for (double f : kProbeFractions) {
-    const double u = cur.startT() + f * (cur.endT() - cur.startT());
-    const V p = PointOn(v, u);
-    const D tangent =
-        GetTangentAt(wc.points, wc.nodes, (unsigned long)wc.count, cur.segment->firstNode + v.last, u, false);
-    // The normal (-y, x) points to the left of the edge.
-    const D n{-tangent.y, tangent.x};
-    double enter = 0.0, leave = 0.0;
-    if (!Finite(p) ||
-        !MavikMath::LineRectIntersection(p, V(p + n), ownFirst ? firstBounds : secondBounds, enter, leave))
-      return false;
-    const V probe[3] = {p + enter * n, p, p + leave * n};
-    const NODETYPE probeNodes[3] = {NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::line};
-    const WeldSegments engine(ProbeCurves(probe, probeNodes, 3, ownFirst),
-                              WeldFillProbeIntersectionSettings(tolerance));
-    if (engine.segments.size() < 2) return false;
-    const int l = CountProbe(engine.segments[1], angleTolerance, 0.0).winding;
-    const int r = CountProbe(engine.segments[0], angleTolerance, 1.0).winding;
-    if (first) {
-      left = l;
-      right = r;
-      first = false;
-    }
-    auto clean = [&](SegmentIntersections const& s, double at) {
-      for (Intersection const* x : s.intersections) {
-        if (x->t == at) {
-          if (x->other->segment != ownIndex) return false;
-        } else if (x->touch || x->overlapEnd) {
+  const double u = cur.startT() + fraction * (cur.endT() - cur.startT());
+  const V p = PointOn(v, u);
+  const D tangent =
+      GetTangentAt(wc.points, wc.nodes, (unsigned long)wc.count, cur.segment->firstNode + v.last, u, false);
+  // The normal (-y, x) points to the left of the edge.
+  const D n{-tangent.y, tangent.x};
+  double enter = 0.0, leave = 0.0;
+  if (!Finite(p) ||
+      !MavikMath::LineRectIntersection(p, V(p + n), ownFirst ? firstBounds : secondBounds, enter, leave))
+    return false;
+  const V probe[3] = {p + enter * n, p, p + leave * n};
+  const NODETYPE probeNodes[3] = {NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::line};
+  const WeldSegments engine(ProbeCurves(probe, probeNodes, 3, ownFirst), WeldFillProbeIntersectionSettings(tolerance));
+  if (engine.segments.size() < 2) return false;
+  left = CountProbe(engine.segments[1], angleTolerance, 0.0).winding;
+  right = CountProbe(engine.segments[0], angleTolerance, 1.0).winding;
+  // Clean: at the edge the probe meets only the edge itself, and elsewhere
+  // only plain crossings (a probe that meets another curve within the
+  // tolerance of the edge, or a node within the tolerance of the probe, may
+  // count a crossing twice).
+  auto clean = [&](SegmentIntersections const& s, double at) {
+    for (Intersection const* x : s.intersections) {
+      if (x->t == at) {
+        SegmentIntersections const& seg = engine.segments[size_t(x->other->segment)];
+        if (engine.curves[size_t(seg.curve)].points != wc.points || seg.firstNode != cur.segment->firstNode)
           return false;
-        }
+      } else if (x->touch || x->overlapEnd) {
+        return false;
       }
-      return true;
-    };
-    if (clean(engine.segments[1], 0.0) && clean(engine.segments[0], 1.0)) {
-      left = l;
-      right = r;
-      return true;
     }
-  }
-  return false;
+    return true;
+  };
+  return clean(engine.segments[1], 0.0) && clean(engine.segments[0], 1.0);
 }
 
 Edge WeldStateData::FindNonZeroNonOverlappingEdge(Edge edge) const {

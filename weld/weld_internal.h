@@ -35,11 +35,28 @@ inline bool IsSubpathStart(SegmentIntersections const& s) noexcept {
   return s.prev < 0 || s.prev != s.index - 1;
 }
 
-// Places along an edge (fractions of its parameter range) where a probe is
-// tried, the middle first, and how many of a subpath's longest edges are
-// tried before the first probe is taken as it is.
-inline constexpr double kProbeFractions[] = {0.5, 0.3, 0.7, 0.15, 0.85, 0.4, 0.6};
-inline constexpr size_t kSeedCandidates = 4;
+// The operand without segments of zero length and without folds (a line
+// running straight back along the line before it), which bound no area but
+// would confuse the graph; shared unchanged when there are none. O(n).
+PolycurveT<MavikMath::V> CleanWeldOperand(PolycurveT<MavikMath::V> const& c);
+
+// The operand without segments all of whose points lie closer than distance
+// to their start (the next segment starts where the outline has got to, its
+// first handle moving with it; a closed outline still ends on its start),
+// then cleaned as above. Moves the outline by less than distance. Shared
+// unchanged when nothing is that short. O(n).
+PolycurveT<MavikMath::V> CollapseShortSegments(PolycurveT<MavikMath::V> const& c, double distance);
+
+// Where probes are tried until one meets nothing but plain crossings: which
+// of a subpath's longest edges (0 the longest) and where along it (a
+// fraction of its parameter range). Few tries: where curves crowd closer
+// than the tolerance no place is clean, and the first probe is taken.
+struct ProbePlace {
+  size_t candidate;
+  double fraction;
+};
+inline constexpr ProbePlace kProbePlan[] = {{0, 0.5}, {1, 0.5}, {0, 0.3}};
+inline constexpr size_t kSeedCandidates = 2;
 
 // Whether every record of a probe segment is a plain crossing (no touch, no
 // shared stretch), apart from records at t == allowLow or t == allowHigh

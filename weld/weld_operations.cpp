@@ -8,10 +8,12 @@
 // small and double arithmetic on products of coordinates keeps about 1e-8
 // units of precision.
 #include <cmath>
+#include <utility>
 
 #include "ostracrv/core/polycurve.h"
 #include "ostracrv/weld/keep_rules.h"
 #include "ostracrv/weld/weldstate.h"
+#include "weld_internal.h"
 
 namespace OstraCrv {
 
@@ -30,23 +32,83 @@ PolycurveT<V> Widened(PolycurveT<T> const& c) {
     return PolycurveT<V>(c);
 }
 
+// How much of an operand's outline an attempt may move to get rid of short
+// segments, for a caller that asked for precise welding: a ten-millionth of
+// the operands' extent.
+constexpr double kPreciseCollapse = 1e-7;
+
+double Extent(PolycurveT<V> const& a, PolycurveT<V> const& b) {
+  MavikMath::BoundsT<double> box;
+  for (PolycurveT<V> const* c : {&a, &b})
+    for (unsigned long i = 0; i < c->GetPointCount(); ++i)
+      if (std::isfinite(c->GetPoint(int(i)).x) && std::isfinite(c->GetPoint(int(i)).y)) box.Add(c->GetPoint(int(i)));
+  return box.IsEmpty() ? 0.0 : std::fmax(box.Width(), box.Height());
+}
+
+// Closes every open subpath of a result with a line back to its start; one
+// of fewer than three nodes, which bounds nothing, goes.
+template <class T>
+void CloseAll(PolycurveT<T>& r) {
+  PolycurveT<T> out;
+  for (PolycurveT<T>& s : r.GetSubpaths()) {
+    if (!s.IsClosed(0)) {
+      if (s.GetPointCount() < 3) continue;
+      s.CloseOpenSubpaths(false);
+    }
+    out.PushBack(s);
+  }
+  r = out;
+}
+
 template <class T>
 PolycurveT<T> Weld(PolycurveT<T> const& first, PolycurveT<T> const& second, bool firstNonZero, bool secondNonZero,
                    WeldFlags flags, WeldKeepRule rule) {
   const PolycurveT<V> a = Widened(first), b = Widened(second);
-  {
-    WeldStateData state(a, firstNonZero, b, secondNonZero, false, false, flags);
+  // An attempt is sound when every count came back to its start round its
+  // loop and every loop closed.
+  struct Attempt {
+    PolycurveT<T> result;
+    bool sound = false;
+    bool closed = false;
+  };
+  auto run = [&](PolycurveT<V> const& x, PolycurveT<V> const& y, WeldFlags f) {
+    WeldStateData state(x, firstNonZero, y, secondNonZero, false, false, f);
     state.PerformWeld(rule);
-    if (state.IsConsistent() || HasWeldFlag(flags, WeldFlags::Precise)) return state.GenerateOutputCurve<T>(false);
+    Attempt at;
+    at.result = state.GenerateOutputCurve<T>(false);
+    at.closed = state.UnclosedLoops() == 0;
+    at.sound = state.IsConsistent() && at.closed;
+    return at;
+  };
+  // Where curves pass within the weld tolerance of each other's nodes, the
+  // graph can miss one side of a meeting (a crossing next to a node taken
+  // for the touch there, or the touch for the crossing): the counts then
+  // disagree round a loop, or the kept edges do not join into loops. The
+  // operation is then done again: at the precise tolerance, where such near
+  // misses are plain crossings; and on operands without segments shorter
+  // than the tolerance, where nodes closer than it are one point, as the
+  // tolerance means them to be. The first sound attempt stands; if none is,
+  // the first whose loops all closed, else the first, with its open loops
+  // closed by a line.
+  const bool precise = HasWeldFlag(flags, WeldFlags::Precise);
+  Attempt best = run(a, b, flags);
+  if (best.sound) return best.result;
+  auto consider = [&](Attempt&& at) {
+    if (at.sound || (at.closed && !best.closed)) best = std::move(at);
+    return best.sound;
+  };
+  if (!precise && consider(run(a, b, flags | WeldFlags::Precise))) return best.result;
+  const double collapse = precise ? kPreciseCollapse * Extent(a, b) : kWeldTolerance;
+  if (collapse > 0.0) {
+    const PolycurveT<V> ca = weld_detail::CollapseShortSegments(a, collapse);
+    const PolycurveT<V> cb = weld_detail::CollapseShortSegments(b, collapse);
+    if (!ca.IsSameData(a) || !cb.IsSameData(b)) {
+      if (consider(run(ca, cb, flags))) return best.result;
+      if (!precise && consider(run(ca, cb, flags | WeldFlags::Precise))) return best.result;
+    }
   }
-  // Two curves passing within the weld tolerance of a node can leave the
-  // graph with a meeting on one side only (a crossing next to the node is
-  // taken for the touch there, and the touch for the crossing). The counts
-  // then disagree round a loop; at the precise tolerance such near misses
-  // are plain crossings, so the operation is done again there.
-  WeldStateData state(a, firstNonZero, b, secondNonZero, false, false, flags | WeldFlags::Precise);
-  state.PerformWeld(rule);
-  return state.GenerateOutputCurve<T>(false);
+  if (!best.closed) CloseAll(best.result);
+  return best.result;
 }
 
 }  // namespace

@@ -436,7 +436,10 @@ PolycurveT<T> WeldStateData::GenerateOutputCurve(bool knife) {
     }
 
     if (!w.IsEmpty() && (closed || !openResult)) {
-      if (!w.CloseLastSubpath(tolerance, false) && forceClose) w.CloseLastSubpath(tolerance, true);
+      if (!w.CloseLastSubpath(tolerance, false)) {
+        if (!openResult) ++unclosedLoops_;
+        if (forceClose) w.CloseLastSubpath(tolerance, true);
+      }
     }
     if (openResult) {
       w = RotateToFirstEnabled(w);

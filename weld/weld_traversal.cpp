@@ -60,30 +60,26 @@ FillStateData WeldStateData::SeedFillState(Edge edge) {
   // little further on, counting one crossing twice; such a ray is cast
   // again through another place, on the same or another long edge.
   Edge e;
-  bool onFirst = false;
-  for (Edge const& c : SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates)) {
-    onFirst = IsOnFirst(c);
-    const MavikMath::BoundsT<double>& bounds = onFirst ? secondBounds : firstBounds;
-    bool clean = false;
-    for (double f : kProbeFractions) {
-      const V p = c.pointAt(c.startT() + f * (c.endT() - c.startT()));
-      FillStateData found;
-      if (MavikMath::IsPointInRect(p, bounds)) {
-        const V probe[2] = {V{bounds.left, p.y}, p};
-        const NODETYPE probeNodes[2] = {NodeTypes::Open::move, NodeTypes::Open::line};
-        const WeldSegments engine(ProbeCurves(probe, probeNodes, 2, !onFirst),
-                                  WeldProbeIntersectionSettings(tolerance));
-        if (engine.segments.empty()) continue;
-        found = CountProbe(engine.segments[0], angleTolerance, std::numeric_limits<double>::quiet_NaN());
-        clean = IsCleanProbe(engine.segments[0], -1.0, 2.0);
-      } else {
-        clean = true;  // outside the other operand's box: outside it
-      }
-      if (!e.valid() || clean) {
-        e = c;
-        state = found;
-      }
-      if (clean) break;
+  const std::vector<Edge> candidates = SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates);
+  const bool onFirst = IsOnFirst(edge);
+  const MavikMath::BoundsT<double>& bounds = onFirst ? secondBounds : firstBounds;
+  for (ProbePlace const& place : kProbePlan) {
+    if (place.candidate >= candidates.size()) continue;
+    Edge const& c = candidates[place.candidate];
+    const V p = c.pointAt(c.startT() + place.fraction * (c.endT() - c.startT()));
+    FillStateData found;
+    bool clean = true;  // outside the other operand's box: outside it
+    if (MavikMath::IsPointInRect(p, bounds)) {
+      const V probe[2] = {V{bounds.left, p.y}, p};
+      const NODETYPE probeNodes[2] = {NodeTypes::Open::move, NodeTypes::Open::line};
+      const WeldSegments engine(ProbeCurves(probe, probeNodes, 2, !onFirst), WeldProbeIntersectionSettings(tolerance));
+      if (engine.segments.empty()) continue;
+      found = CountProbe(engine.segments[0], angleTolerance, std::numeric_limits<double>::quiet_NaN());
+      clean = IsCleanProbe(engine.segments[0], -1.0, 2.0);
+    }
+    if (!e.valid() || clean) {
+      e = c;
+      state = found;
     }
     if (clean) break;
   }

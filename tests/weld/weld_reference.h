@@ -71,6 +71,48 @@ inline bool Inside(std::vector<Poly> const& polys, V p, bool nonZero) {
   return nonZero ? w != 0 : (c & 1) != 0;
 }
 
+// The same winding test with the edges sorted into horizontal bands, for
+// many queries against large polygon sets.
+class RayIndex {
+ public:
+  explicit RayIndex(std::vector<Poly> const& polys) {
+    for (Poly const& poly : polys)
+      for (size_t i = 0; i < poly.size(); ++i) {
+        const V a = poly[i], b = poly[(i + 1) % poly.size()];
+        if (a.y == b.y) continue;
+        edges_.push_back({a, b});
+        lo_ = std::fmin(lo_, std::fmin(a.y, b.y));
+        hi_ = std::fmax(hi_, std::fmax(a.y, b.y));
+      }
+    bands_.resize(std::max<size_t>(1, edges_.size() / 4));
+    for (size_t e = 0; e < edges_.size(); ++e) {
+      const auto [a, b] = edges_[e];
+      for (size_t k = Band(std::fmin(a.y, b.y)); k <= Band(std::fmax(a.y, b.y)); ++k) bands_[k].push_back(e);
+    }
+  }
+  bool Inside(V p, bool nonZero) const {
+    if (edges_.empty() || !(p.y >= lo_ && p.y <= hi_)) return false;
+    int winding = 0, crossings = 0;
+    for (size_t e : bands_[Band(p.y)]) {
+      const auto [a, b] = edges_[e];
+      if ((a.y <= p.y) == (b.y <= p.y)) continue;
+      if (a.x + (p.y - a.y) * (b.x - a.x) / (b.y - a.y) <= p.x) continue;
+      ++crossings;
+      winding += b.y > a.y ? 1 : -1;
+    }
+    return nonZero ? winding != 0 : (crossings & 1) != 0;
+  }
+
+ private:
+  size_t Band(double y) const {
+    const double f = (y - lo_) / (hi_ - lo_) * double(bands_.size());
+    return size_t(std::clamp(f, 0.0, double(bands_.size() - 1)));
+  }
+  std::vector<std::pair<V, V>> edges_;
+  std::vector<std::vector<size_t>> bands_;
+  double lo_ = INFINITY, hi_ = -INFINITY;
+};
+
 inline double SegmentDistance(V p, V a, V b) {
   const double dx = b.x - a.x, dy = b.y - a.y, l2 = dx * dx + dy * dy;
   double t = l2 > 0 ? ((p.x - a.x) * dx + (p.y - a.y) * dy) / l2 : 0.0;
@@ -96,6 +138,7 @@ inline double Distance(std::vector<Poly> const& polys, V p) {
 template <class T>
 double EvenOddArea(OstraCrv::PolycurveT<T> const& c) {
   const auto flat = Flatten(c, 64);
+  const RayIndex index(flat);
   MavikMath::BoundsT<double> box;
   for (auto const& poly : flat)
     for (V p : poly) box.Add(p);
@@ -184,8 +227,8 @@ double EvenOddArea(OstraCrv::PolycurveT<T> const& c) {
     }
     const double off = std::fmin(eps, 0.25 * MavikMath::Distance(from, to));
     const V nrm{-dir.y / len * off, dir.x / len * off};
-    const bool left = Inside(flat, V{mid.x + nrm.x, mid.y + nrm.y}, false);
-    const bool right = Inside(flat, V{mid.x - nrm.x, mid.y - nrm.y}, false);
+    const bool left = index.Inside(V{mid.x + nrm.x, mid.y + nrm.y}, false);
+    const bool right = index.Inside(V{mid.x - nrm.x, mid.y - nrm.y}, false);
     loop.push_back({g, left == right ? 0 : (left ? 1 : -1), from, to});
   }
   finish();

@@ -251,6 +251,11 @@ class WeldStateData {
   // segment but not its partner (two curves passing within the tolerance of
   // a node): the result may then have open or wrong loops.
   bool IsConsistent() const noexcept { return consistent_; }
+  // The number of loops that the last GenerateOutputCurve (without
+  // OpenResult) could not close within the tolerance, before ForceClose.
+  // Where nodes of both operands crowd closer than the tolerance, the graph
+  // can snap them into meetings that no walk can get through.
+  int UnclosedLoops() const noexcept { return unclosedLoops_; }
 
   // The next edge of an output walk from edge in direction dir on side side:
   // a turn onto another curve at the far end (tried on both sides, and at
@@ -285,11 +290,14 @@ class WeldStateData {
   bool sidesFilled_ = false;  // PopulateFilledSides has run
   bool consistent_ = true;    // every count came back to its start round each loop
   int firstSegmentCount_ = 0;  // segments of the first operand's curves
+  std::vector<MavikMath::BoundsT<double>> curveBoxes_;  // loose box of each curve, for probes
+  int unclosedLoops_ = 0;      // loops the output walk could not close
 
   // Runs CountIntersection for every record of probe segment `s` of a probe
   // engine, skipping records at t == skipT (NaN skips none).
   static FillStateData CountProbe(SegmentIntersections const& s, double angleTolerance, double skipT);
-  // The probe curves: the probe, then every curve of one operand inactive.
+  // The probe curves: the probe, then every curve of one operand whose box
+  // meets the probe's, inactive.
   // Which shared stretches a safe edge must avoid: those with any curve, with
   // the other operand, with the own operand's curves, or none.
   enum class SharedWith { Anything, OtherOperand, OwnOperand, Nothing };
@@ -300,9 +308,9 @@ class WeldStateData {
   // walking order. O(edges of the subpath).
   std::vector<Edge> SafeEdges(Edge edge, SharedWith avoid, size_t count) const;
   // The left and right winding of the own operand beside cur, by a probe
-  // along the normal; true when the probe met nothing but plain crossings
-  // (else the first probe's counts are given).
-  bool SeedSides(Edge const& cur, bool ownFirst, int& left, int& right) const;
+  // along the normal at the given fraction of its parameter range; true
+  // when the probe met nothing but plain crossings.
+  bool SeedSides(Edge const& cur, double fraction, bool ownFirst, int& left, int& right) const;
   std::vector<WeldCurve> ProbeCurves(V const* points, NODETYPE const* nodes, int count, bool ownFirst) const;
   // The bits of the other operand's filled sides under an overlap entry
   // (PerformWeld, open overlaps).

@@ -34,6 +34,21 @@ expect(0 "" render ${SAMPLES}/letter.svg --output=${WORK}/letter.svg)
 # Geometry read up to a path data error still counts as read.
 expect(0 "baddata.svg: line 1: <path> d: expected a number at offset 11" info ${WORK}/baddata.svg)
 
+# The set operations: two shapes of one sample against a shifted copy.
+file(WRITE ${WORK}/disc.svg "<svg xmlns='http://www.w3.org/2000/svg' viewBox='0 0 200 160'><circle cx='75' cy='80' r='55'/></svg>")
+file(WRITE ${WORK}/box.svg "<svg xmlns='http://www.w3.org/2000/svg' viewBox='0 0 200 160'><rect x='60' y='20' width='100' height='80'/></svg>")
+expect(0 "union: 1 loop" union ${WORK}/disc.svg ${WORK}/box.svg -o ${WORK}/union.svg)
+expect(0 "intersect: 1 loop" intersect ${WORK}/disc.svg ${WORK}/box.svg -o ${WORK}/intersect.svg --precise)
+expect(0 "subtract: 1 loop" subtract ${WORK}/disc.svg ${WORK}/box.svg --output=${WORK}/subtract.svg)
+expect(0 "xor: 2 loops" xor ${WORK}/disc.svg ${WORK}/box.svg -o ${WORK}/xor.svg --evenodd)
+expect(0 "union: " union ${SAMPLES}/overlap.svg ${SAMPLES}/ring.svg -o ${WORK}/mixed.svg)
+expect(0 "<path id=\"union\"" info ${WORK}/union.svg)
+expect(0 "usage: crv union" help xor)
+expect(2 "expects two files" union ${WORK}/disc.svg -o ${WORK}/x.svg)
+expect(2 "exclude each other" xor ${WORK}/disc.svg ${WORK}/box.svg -o ${WORK}/x.svg --nonzero --evenodd)
+expect(2 "needs an output file" intersect ${WORK}/disc.svg ${WORK}/box.svg)
+expect(1 "cannot open file" subtract ${WORK}/disc.svg ${WORK}/missing.svg -o ${WORK}/x.svg)
+
 # Bad usage.
 expect(2 "usage: crv")
 expect(2 "unknown command 'frobnicate'" frobnicate)

@@ -21,6 +21,8 @@ const char* const kHelp =
     "                                bounds of every path and subpath\n"
     "  render FILE.svg -o OUT.svg    draw the paths with nodes, control points and handles\n"
     "                                marked (--png also writes a PNG)\n"
+    "  union A.svg B.svg -o OUT.svg  the filled area of A or B; also intersect (A and B),\n"
+    "                                subtract (A and not B) and xor (exactly one)\n"
     "  help [COMMAND]                this text, or the help of one command\n"
     "\n"
     "'crv COMMAND --help' shows the help of a command.\n"
@@ -45,6 +47,8 @@ int main(int argc, char** argv) {
   args.erase(args.begin());
   if (command == "info") return crv::RunInfo(args);
   if (command == "render") return crv::RunRender(args);
+  if (command == "union" || command == "intersect" || command == "subtract" || command == "xor")
+    return crv::RunWeld(command, args);
   if (command == "help" || command == "--help" || command == "-h") {
     if (args.empty()) {
       std::cout << kHelp;
@@ -56,6 +60,10 @@ int main(int argc, char** argv) {
     }
     if (args[0] == "render") {
       std::cout << crv::kRenderHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "union" || args[0] == "intersect" || args[0] == "subtract" || args[0] == "xor") {
+      std::cout << crv::kWeldHelp;
       return crv::kOk;
     }
     std::cerr << "crv help: unknown command '" << args[0] << "'\n";

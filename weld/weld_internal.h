@@ -49,14 +49,16 @@ PolycurveT<MavikMath::V> CollapseShortSegments(PolycurveT<MavikMath::V> const& c
 
 // Where probes are tried until one meets nothing but plain crossings: which
 // of a subpath's longest edges (0 the longest) and where along it (a
-// fraction of its parameter range). Few tries: where curves crowd closer
-// than the tolerance no place is clean, and the first probe is taken.
+// fraction of its parameter range). Several edges, since the longest may be
+// a side of a thin spike whose other side lies within the tolerance of it
+// all along; but few tries, since where curves crowd closer than the
+// tolerance no place is clean, and the first probe is then taken.
 struct ProbePlace {
   size_t candidate;
   double fraction;
 };
-inline constexpr ProbePlace kProbePlan[] = {{0, 0.5}, {1, 0.5}, {0, 0.3}};
-inline constexpr size_t kSeedCandidates = 2;
+inline constexpr ProbePlace kProbePlan[] = {{0, 0.5}, {1, 0.5}, {2, 0.5}, {3, 0.5}, {0, 0.3}, {1, 0.3}};
+inline constexpr size_t kSeedCandidates = 4;
 
 // Whether every record of a probe segment is a plain crossing (no touch, no
 // shared stretch), apart from records at t == allowLow or t == allowHigh

@@ -112,6 +112,16 @@ WeldStateData::WeldStateData(PolycurveT<V> const& firstIn, bool firstNonZeroIn, 
   if (alwaysFillSides || firstNonZero || secondNonZero || segments->overlapCount > 0) PopulateFilledSides();
 }
 
+WeldStateData::~WeldStateData() = default;
+
+RayWinding const& WeldStateData::Rays(bool firstOperand) const {
+  std::unique_ptr<RayWinding>& r = rays_[firstOperand ? 0 : 1];
+  if (!r)
+    r = std::make_unique<RayWinding>(curves, firstOperand ? 0 : size_t(firstCurveCount),
+                                     firstOperand ? size_t(firstCurveCount) : curves.size());
+  return *r;
+}
+
 Edge WeldStateData::FirstEdge() const noexcept { return Edge::First(segments.get(), 0); }
 
 bool WeldStateData::IsOpenCurve(int c) const noexcept {
@@ -239,6 +249,21 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
   const V p = PointOn(v, u);
   const D tangent =
       GetTangentAt(wc.points, wc.nodes, (unsigned long)wc.count, cur.segment->firstNode + v.last, u, false);
+  // Where no other curve of the operand comes within the tolerance, the
+  // winding numbers beside the edge are exact: a horizontal ray gives the one
+  // just left of the place, and the edge itself, crossing the ray's line
+  // there, adds its one to the other side.
+  if (tangent.y != 0.0) {
+    int w = 0;
+    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w)) {
+      const int beyond = w + (tangent.y < 0.0 ? 1 : -1);  // just right of the place
+      // Going up, the edge has its left side towards -x.
+      const int wLeft = tangent.y > 0.0 ? w : beyond, wRight = tangent.y > 0.0 ? beyond : w;
+      left = -wLeft;
+      right = wRight;
+      return true;
+    }
+  }
   // The normal (-y, x) points to the left of the edge.
   const D n{-tangent.y, tangent.x};
   double enter = 0.0, leave = 0.0;

@@ -5,6 +5,7 @@
 
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/intersect/segments.h"
+#include "ostracrv/math/rect.h"
 #include "ostracrv/math/vector2d.h"
 #include "ostracrv/weld/weldstate.h"
 
@@ -92,5 +93,31 @@ struct Tie {
 void CountPassage(FillStateData& state, Intersection const* crossing, double angleTolerance,
                   std::vector<Intersection const*>* list, bool ownAsInterior, bool otherAsInterior,
                   SidedCount sided);
+
+// Exact winding numbers of a set of curves at single places (see
+// ray_winding.cpp).
+class RayWinding {
+ public:
+  // Over the segments of curves[from .. to).
+  RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to);
+  // The winding number (counter-clockwise loops +1) at q, leaving out the
+  // crossing of the segment whose first point is *skip at parameter skipT
+  // (the segment q lies on; null for none). False, and 0, when a segment
+  // other than that one comes within tolerance of q, or q is not finite.
+  bool Winding(MavikMath::V q, double tolerance, MavikMath::V const* skip, double skipT, int& winding) const;
+
+ private:
+  struct Piece {
+    MavikMath::V const* points = nullptr;
+    bool bezier = false;
+    MavikMath::BoundsT<double> box;
+  };
+  size_t Band(double y) const noexcept;
+  int Crossings(Piece const& s, MavikMath::V q, double skipT) const;
+
+  std::vector<Piece> pieces_;
+  std::vector<std::vector<size_t>> bands_;
+  MavikMath::BoundsT<double> box_;
+};
 
 }  // namespace OstraCrv::weld_detail

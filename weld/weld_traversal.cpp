@@ -69,7 +69,12 @@ FillStateData WeldStateData::SeedFillState(Edge edge) {
     const V p = c.pointAt(c.startT() + place.fraction * (c.endT() - c.startT()));
     FillStateData found;
     bool clean = true;  // outside the other operand's box: outside it
-    if (MavikMath::IsPointInRect(p, bounds)) {
+    int w = 0;
+    if (MavikMath::IsPointInRect(p, bounds) && Rays(!onFirst).Winding(p, tolerance, nullptr, 0.0, w)) {
+      // No curve of the other operand within the tolerance: its winding
+      // number here is exact.
+      found.winding = w;
+    } else if (MavikMath::IsPointInRect(p, bounds)) {
       const V probe[2] = {V{bounds.left, p.y}, p};
       const NODETYPE probeNodes[2] = {NodeTypes::Open::move, NodeTypes::Open::line};
       const WeldSegments engine(ProbeCurves(probe, probeNodes, 2, !onFirst), WeldProbeIntersectionSettings(tolerance));

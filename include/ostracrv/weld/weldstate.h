@@ -57,6 +57,9 @@
 namespace OstraCrv {
 
 using WeldSegments = SegmentsT<MavikMath::V>;
+namespace weld_detail {
+class RayWinding;
+}
 using WeldCurve = IntersectionCurveT<MavikMath::V>;
 
 // Pseudo-angle of a direction: grows with the polar angle like the angle
@@ -213,6 +216,7 @@ class WeldStateData {
                 bool includeOpen, bool alwaysFillSides, WeldFlags flags);
   WeldStateData(WeldStateData const&) = delete;
   WeldStateData& operator=(WeldStateData const&) = delete;
+  ~WeldStateData();
 
   // The first edge of the graph in storage order; no edge for an empty graph.
   Edge FirstEdge() const noexcept;
@@ -291,6 +295,9 @@ class WeldStateData {
   bool consistent_ = true;    // every count came back to its start round each loop
   int firstSegmentCount_ = 0;  // segments of the first operand's curves
   std::vector<MavikMath::BoundsT<double>> curveBoxes_;  // loose box of each curve, for probes
+  // Exact ray casting over each operand's curves, built on first use.
+  mutable std::unique_ptr<weld_detail::RayWinding> rays_[2];
+  weld_detail::RayWinding const& Rays(bool firstOperand) const;
   int unclosedLoops_ = 0;      // loops the output walk could not close
 
   // Runs CountIntersection for every record of probe segment `s` of a probe

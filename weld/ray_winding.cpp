@@ -63,8 +63,10 @@ RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t
   }
   if (pieces_.empty()) return;
   bands_.resize(std::max<size_t>(1, pieces_.size() / 2));
-  for (size_t k = 0; k < pieces_.size(); ++k)
-    for (size_t b = Band(pieces_[k].box.bottom); b <= Band(pieces_[k].box.top); ++b) bands_[b].push_back(k);
+  for (size_t k = 0; k < pieces_.size(); ++k) {
+    pieces_[k].firstBand = Band(pieces_[k].box.bottom);
+    for (size_t b = pieces_[k].firstBand; b <= Band(pieces_[k].box.top); ++b) bands_[b].push_back(k);
+  }
 }
 
 size_t RayWinding::Band(double y) const noexcept {
@@ -85,7 +87,7 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
   for (size_t b = lo; b <= hi; ++b)
     for (size_t k : bands_[b]) {
       Piece const& s = pieces_[k];
-      if (std::max(Band(s.box.bottom), lo) != b) continue;
+      if (std::max(s.firstBand, lo) != b) continue;
       const bool own = s.points == skip;
       // Nearness: no other segment may come within the tolerance.
       if (!own && q.x >= s.box.left - tolerance && q.x <= s.box.right + tolerance &&

@@ -111,6 +111,7 @@ class RayWinding {
     MavikMath::V const* points = nullptr;
     bool bezier = false;
     MavikMath::BoundsT<double> box;
+    size_t firstBand = 0;
   };
   size_t Band(double y) const noexcept;
   int Crossings(Piece const& s, MavikMath::V q, double skipT) const;

@@ -12,18 +12,21 @@
 //     box, well clear of anything the tolerances could snap to.
 //
 // Filled sides. For each subpath, the winding numbers of its own operand on
-// the left and the right of its first edge that has length are found by a
-// probe: a straight line along the normal at the middle of that edge, clipped
-// to the operand's box and split at the edge, run through the intersection
-// engine against every curve of the operand. Counting the records on the
-// half behind the edge (to the left) gives the left winding, on the half in
-// front the right winding, each up to a sign that CountIntersection keeps
-// consistent. From there the two counts are carried along the subpath: at
-// every crossing with the own operand (another subpath or the subpath
-// itself) both sides change together. A count is "filled" when it is non-zero
-// under the non-zero rule or odd under even-odd. The probe runs with touches
-// preferred to crossings, so that a probe through a node counts the node
-// once.
+// the left and the right of one of its edges are found at a place where no
+// other curve of the operand comes within the tolerance: exactly, by a ray
+// over the operand's segments (the place's own edge, crossing the ray's
+// line there, separates the two sides). Where no such place is found, a
+// probe is run through the engine instead: a straight line along the normal
+// at the place, clipped to the operand's box and split there, against every
+// curve of the operand whose box it meets; the records on the half towards
+// the left give the left winding, on the other half the right winding, each
+// up to a sign that CountIntersection keeps consistent (touches preferred
+// to crossings, so that a probe through a node counts the node once). From
+// there the two counts are carried round the subpath: at a crossing with
+// the own operand (another subpath or the subpath itself) both sides change
+// together; where another curve of the operand joins or leaves along a
+// shared stretch, only the side it lies on. A count is "filled" when it is
+// non-zero under the non-zero rule or odd under even-odd.
 #include <algorithm>
 #include <cmath>
 #include <limits>

@@ -34,12 +34,27 @@
 // the weld pass) uses the same rule, so counts carried along a curve and
 // counts cast by a probe agree.
 //
+// Seeds. Each subpath's counts start from a place on one of its longest
+// edges where no other curve comes within the weld tolerance: there the
+// graph's winding numbers are the exact ones, found by casting a ray over
+// banded segments; only where no such place exists is a probe run through
+// the intersection engine. Round a closed subpath a count must come back to
+// its start; when one does not (curves passing a node within the tolerance
+// can leave the engine with one side of a meeting), the state says so (see
+// IsConsistent) and the set operations do the work again at the precise
+// tolerance.
+//
+// Operands are cleaned first of what bounds no area but would confuse the
+// graph: segments of zero length and folds (a line running straight back
+// along the line before it).
+//
 // Bounds of work. Every walk of this header is bounded by the number of
 // edges: walks along a curve stop where they come back to where they began,
 // and a walk over zero-length edges stops at the first edge with length.
 // The graph is built in O(s log s + k) for s segments and k meetings (the
-// engine's pair search), the filled sides cost one probe per subpath (O(s)
-// each), and the weld pass is O(e) for e edges plus one probe per subpath.
+// engine's pair search); seeding a subpath costs a pass over its edges and a
+// ray over the segments in one band of heights; the weld pass and the
+// output are O(e) for e edges.
 #pragma once
 
 #include <cstdint>
@@ -228,9 +243,11 @@ class WeldStateData {
   bool IsOpenCurve(int c) const noexcept;
 
   // Computes sides(edge) for every edge: the winding of the own operand on
-  // both sides, seeded per subpath by a probe along the normal of its first
-  // edge with length and carried along the curve across the operand's own
-  // crossings. One probe per subpath: O(subpaths x segments).
+  // both sides, seeded per subpath (on a closed one at one of its longest
+  // edges, on an open one at its first edge with length) and carried along
+  // the curve across the operand's own crossings, where another curve of the
+  // operand joining or leaving along a shared stretch changes only the side
+  // it lies on.
   void PopulateFilledSides();
   // From edge forward, the first edge whose parameter range is longer than
   // the angle tolerance and that lies on no shared stretch (of any curve);

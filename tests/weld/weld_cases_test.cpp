@@ -175,6 +175,13 @@ TEST(WeldCases, OpenResultAndFollowCurve) {
   EXPECT_EQ(pieces.GetLastPoint(), (V{100, 50}));
   // Going straight on first changes nothing where curves cross simply.
   EXPECT_NEAR(EvenOddArea(PolycurveD::Union(a, b, false, false, WeldFlags::FollowCurve)), 17500.0, 1e-9);
+  // Edges of the first operand that no crossing with a closed curve bounds
+  // are not drawn: of two disjoint squares only the second stays.
+  const PolycurveD far = Rect(300, 0, 400, 100);
+  const PolycurveD trimmed = PolycurveD::Union(a, far, false, false, WeldFlags::TrimDangling);
+  ASSERT_EQ(Loops(trimmed), 1);
+  EXPECT_NEAR(EvenOddArea(trimmed), 10000.0, 1e-9);
+  EXPECT_GE(trimmed.GetPoint(0).x, 300.0);
 }
 
 // The filled sides recorded on the graph.

@@ -243,25 +243,4 @@ TEST(WeldProperties, ClassificationInteger) {
   CheckClassification<POINT>(rng, Cases(200), 4.0);
 }
 
-// The integer form rounds intersection points, so its areas agree with the
-// double form's to the rounding of the nodes.
-TEST(WeldProperties, IntegerAreasFollowDouble) {
-  std::mt19937 rng(5);
-  for (int iter = 0; iter < 60; ++iter) {
-    const Case c = MakeCase(rng, iter % kKinds);
-    const OstraCrv::Polycurve a(c.a), b(c.b);
-    const PolycurveD ad(a), bd(b);
-    for (int op = 0; op < 4; ++op) {
-      const OstraCrv::Polycurve ri = Apply(Op(op), a, b, c.nonZeroA, c.nonZeroB, WeldFlags::None);
-      const PolycurveD rd = Apply(Op(op), ad, bd, c.nonZeroA, c.nonZeroB, WeldFlags::None);
-      for (unsigned long i = 0; i < ri.GetPointCount(); ++i) {
-        // Every coordinate is a rounded double of the same walk.
-        ASSERT_LE(std::fabs(double(ri.GetPoint(int(i)).x) - rd.GetPoint(int(i)).x), 1.0 + 1e-9);
-        ASSERT_LE(std::fabs(double(ri.GetPoint(int(i)).y) - rd.GetPoint(int(i)).y), 1.0 + 1e-9);
-      }
-      ASSERT_EQ(ri.GetPointCount(), rd.GetPointCount()) << c.kind << " " << kOpNames[op];
-    }
-  }
-}
-
 }  // namespace

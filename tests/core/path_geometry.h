@@ -76,14 +76,6 @@ double Length(const T* pts, const NODETYPE* nds, int n) {
   return l;
 }
 
-// All flattened points of a path, subpath borders ignored.
-template <class T>
-std::vector<V> Samples(const T* pts, const NODETYPE* nds, int n, int steps = 64) {
-  std::vector<V> all;
-  for (const auto& poly : Flatten(pts, nds, n, steps)) all.insert(all.end(), poly.begin(), poly.end());
-  return all;
-}
-
 // Distance from q to the nearest chord of a flattening.
 inline double DistanceToPolylines(const std::vector<std::vector<V>>& polys, const V& q) {
   double best = std::numeric_limits<double>::infinity();

@@ -89,9 +89,11 @@ constexpr S SquaredDistance(const vector2dT<S, A>& a, const vector2dT<S, B>& b) 
 }
 template <class S, bool A, bool B>
 S Distance(const vector2dT<S, A>& a, const vector2dT<S, B>& b) noexcept { return std::hypot(a.x - b.x, a.y - b.y); }
-// Linear interpolation a + (b - a) t, exact at t = 0 and t = 1.
+// Linear interpolation a + (b - a) t. Exact at t = 0, at t = 1 (where the
+// plain formula can miss b in the last bit) and when a equals b.
 template <class S, bool A>
 constexpr vector2dT<S, A> Lerp(const vector2dT<S, A>& a, const vector2dT<S, A>& b, S t) noexcept {
+  if (t == S(1)) return b;
   return {a.x + (b.x - a.x) * t, a.y + (b.y - a.y) * t};
 }
 

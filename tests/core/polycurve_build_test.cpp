@@ -11,6 +11,7 @@
 
 #include "core/path_geometry.h"
 #include "core/random_paths.h"
+#include "ostracrv/core/curvesegment.h"
 #include "polycurve.h"
 
 namespace {
@@ -232,6 +233,52 @@ TEST(Build, CircularArcTo) {
   EXPECT_EQ(c.GetPointCount(), 5u);
 }
 
+TEST(Build, CircularArcToFromTheCurvesOwnTangent) {
+  PolycurveD c;
+  c.MoveTo(V{0, 0});
+  // After a lone start: a clockwise half circle bulging left of the chord.
+  ASSERT_TRUE(c.CircularArcTo(V{10, 0}));
+  ASSERT_EQ(c.GetPointCount(), 7u);
+  EXPECT_LT(MavikMath::Distance(c.GetPoint(3), V{5, 5}), 1e-9);
+  // Then on along the arrival direction (straight down at (10, 0)): the chord
+  // to (20, 0) lies left of it, so the next half circle turns left, below.
+  ASSERT_TRUE(c.CircularArcTo(V{20, 0}));
+  ASSERT_EQ(c.GetPointCount(), 13u);
+  EXPECT_LT(MavikMath::Distance(c.GetPoint(9), V{15, -5}), 1e-9);
+  EXPECT_LT(MavikMath::Distance(c.GetLastPoint(), V{20, 0}), 1e-9);
+  EXPECT_TRUE(Valid(c));
+}
+
+TEST(Build, AppendingEveryViewRebuildsTheCurve) {
+  std::mt19937 rng(25);
+  for (int k = 0; k < 500; ++k) {
+    const testpaths::Path path = testpaths::Make(rng);
+    const auto pts = testgeo::PointsFor<V>(path, rng);
+    const PolycurveD c(pts.data(), path.nodes.data(), path.nodes.size());
+    PolycurveD target;
+    for (const auto& view : OstraCrv::details<V>::GetCurveSegments_Base(c)) view.AppendTo(target, true);
+    // Expected: the same points and kinds with the same closure, except that a
+    // dangling move is replaced by the move that follows it, and a closed
+    // subpath of two nodes (one line out and back) cannot close by tolerance.
+    std::vector<V> ep;
+    Bytes en;
+    for (size_t s = 0; s < path.subpaths.size(); ++s) {
+      const auto& sp = path.subpaths[s];
+      if (sp.first == sp.last && s + 1 < path.subpaths.size()) continue;
+      const NODETYPE keep = NodeMask::kType | (sp.last - sp.first == 1 ? 0 : NodeMask::kClosed);
+      for (int i = sp.first; i <= sp.last; ++i) {
+        ep.push_back(pts[i]);
+        en.push_back(NODETYPE(path.nodes[i] & keep));
+      }
+    }
+    ASSERT_EQ(std::vector<V>(target.GetPoints(), target.GetPoints() + target.GetPointCount()), ep) << k;
+    Bytes got = NodesOf(target);
+    for (NODETYPE& b : got) b &= NodeMask::kType | NodeMask::kClosed;
+    ASSERT_EQ(got, en) << k;
+    ASSERT_TRUE(Valid(target));
+  }
+}
+
 template <class T>
 void RunRandomEdits(unsigned seed) {
   using C = OstraCrv::PolycurveT<T>;
@@ -251,7 +298,7 @@ void RunRandomEdits(unsigned seed) {
         case 1: if (!c.IsEmpty()) c.LineTo(p); break;
         case 2: c.LineTo(p, true); break;
         case 3: if (!c.IsEmpty()) c.CubicTo(pt(), pt(), p); break;
-        case 4: c.CircularArcTo(p, D{u(rng), u(rng)}); break;
+        case 4: rng() % 2 ? c.CircularArcTo(p, D{u(rng), u(rng)}) : c.CircularArcTo(p); break;
         case 5: c.CloseLastSubpath(rng() % 3 ? 0.0 : 50.0, rng() % 2); break;
         case 6: c.CloseOpenSubpaths(rng() % 2); break;
         case 7: c.PopLastSegment(); break;

@@ -277,6 +277,10 @@ class PolycurveT {
   // direction tangent (a line where no arc fits). False, with nothing changed,
   // on an empty curve or when no arc or line can be built (non-finite input).
   bool CircularArcTo(T const& p, MavikMath::vector2dT<double, false> const& tangent);
+  // The same with the direction in which the curve arrives at its end; after
+  // a lone first node, the chord turned a quarter counter-clockwise, which
+  // gives a clockwise half circle bulging to the left of the chord.
+  bool CircularArcTo(T const& p);
 
   // Appends p as a start node unless the curve ends exactly at p; then the
   // last node only takes over the enabled bit and the continuity of node.

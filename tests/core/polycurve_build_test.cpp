@@ -210,6 +210,8 @@ TEST(Build, MakersGiveValidShapes) {
   // Both point kinds: clockwise, the same positive area.
   EXPECT_DOUBLE_EQ(Area(Polycurve::CreateRectangle(box)), 40.0 * 25.0);
   EXPECT_DOUBLE_EQ(Area(PolycurveD::CreateRectangle(box)), 40.0 * 25.0);
+  EXPECT_DOUBLE_EQ(PolycurveD::CreateRectangle(box).GetArea(), Polycurve::CreateRectangle(box).GetArea());
+  EXPECT_GT(PolycurveD::CreateRectangle(box).GetArea(), 0.0);
   PolycurveD c = PolycurveD::CreateCircle(V{0, 0}, 10);
   c.CreateEllipseSubpath(V{100, 0}, V{20, 5});
   c.Create3PointArcSubpath(V{0, 0}, V{10, 0}, V{5, 5});

@@ -15,6 +15,7 @@
 #include "ostracrv/core/subcurve_range.h"
 #include "ostracrv/core/subpath_list.h"
 #include "ostracrv/core/subpath_spin.h"
+#include "ostracrv/io/svg_path.h"
 #include "ostracrv/math/angles.h"
 #include "ostracrv/math/bezier_area.h"
 #include "ostracrv/math/bezier_basis.h"

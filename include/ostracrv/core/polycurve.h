@@ -299,6 +299,17 @@ class PolycurveT {
   // appended whole. closeAfter then tries CloseLastSubpath(tolerance, false).
   // An empty other changes nothing.
   void AppendWithJoin(PolycurveT const& other, bool closeAfter, double tolerance);
+  // Appends other and welds its ends to the nearest open ends of this curve
+  // (FindClosestOpenPointOnCurve; squared distances at most tolerance
+  // squared; if both ends find the same node, the farther one searches again
+  // without it). The weld is asked with this curve's old last node standing
+  // in for other's first node, an established quirk: a weld of other's first
+  // end joins its nearest open end to this curve's old last node, a weld of
+  // other's last end joins it to its nearest open end, and with both ends
+  // within tolerance the request is refused. Returns whether a weld was
+  // made; the append stays in any case. An empty other changes nothing; on
+  // an empty curve other is appended.
+  bool JoinEndpoints(PolycurveT const& other, double tolerance);
 
   // Closes the last subpath when it has at least three nodes and its ends lie
   // within tolerance: both ends move to their midpoint (the integer form
@@ -459,6 +470,15 @@ class PolycurveT {
   // order. With dropDangling, open stretches of a single node are removed
   // from this curve and not returned. O(n).
   PolycurveT ExtractOpenSubpaths(bool dropDangling);
+  // Closes the subpath that holds node: the selection is replaced by its two
+  // ends, which are then joined with a line where they do not meet
+  // (JoinEnabledAddingLineSegments). A subpath of a single line stays open.
+  // False for a node out of range or a single-node subpath; true otherwise,
+  // also when nothing could be closed.
+  bool CloseSubpath(unsigned long node);
+  // Opens every closed subpath at its closing point; no node is added, and
+  // the segments stay. Stray moves are tidied away. O(n) per closed subpath.
+  void OpenAllSubpaths();
 
  public:
   // ---- Measurement ----
@@ -538,6 +558,65 @@ class PolycurveT {
   // segment ending at endNode; and from there to the end of the curve.
   double GetLengthAlongCurveTo(unsigned long endNode, double t) const;
   double GetLengthFrom(unsigned long endNode, double t) const;
+
+ public:
+  // ---- Node selection ----
+  // The enabled bit of each node (see node_selection.h). Every method that
+  // changes bits forks first; none of them keeps the twins of a closed
+  // subpath in step unless it says so. An arc that loses the enabled bit
+  // loses its user bit as well (a control point is offered only while it
+  // follows the selection).
+
+  // Indices of the nodes with the enabled bit, in order; arcs only with
+  // includeArcs.
+  std::vector<unsigned long> GetEnabledNodes(bool includeArcs) const;
+  // Filters indices in list order, dropping those out of range and those not
+  // enabled. With treatArcsByNeighbours an arc stays only when the node kept
+  // before it was enabled and the Bezier's end node is an enabled curve: a
+  // control point counts as selected when both ends of its Bezier are.
+  std::vector<unsigned long> GetEnabledNodesFrom(std::vector<unsigned long> indices,
+                                                 bool treatArcsByNeighbours) const;
+  std::vector<unsigned long> GetEnabledNodesFrom(SubcurveRange range, bool treatArcsByNeighbours) const;
+  // Enabled non-arc nodes that are the first or last node of an open subpath.
+  std::vector<unsigned long> GetEnabledOpenEndNodes() const;
+  // Clears the selection (CRV_DisableAllNodes), then enables each listed
+  // index inside the curve.
+  void SetEnabledNodes(std::vector<unsigned long> const& indices);
+  void DisableAllNodes();
+  // Enables every node and refreshes the arc marks.
+  void EnableAllNodes();
+  // The arc refresh; returns the number of selected nodes.
+  int EnableAllControls();
+  // Every node gets the enabled bit exactly when it is an end of an open
+  // (respectively closed) subpath.
+  void EnableFirstAndLastInOpenSubpaths();
+  void EnableFirstAndLastInClosedSubpaths();
+  // One bit of node i; ignored out of range.
+  void SetEnabled(unsigned long i, bool on);
+  // The bit on first .. first+count-1, cut at the size.
+  void SetEnabled(unsigned long first, unsigned long count, bool on);
+  // The bit on all nodes of node's subpath, arcs included; ignored out of
+  // range.
+  void SetSubpathEnabled(unsigned long node, bool on);
+  // Whether any byte, arcs included, has the enabled bit.
+  bool AnyEnabled() const;
+  // The bit of node i; false out of range.
+  bool IsEnabled(unsigned long i) const;
+  // Clears the selection, then copies the enabled bit of other's first
+  // min(count, other's count) nodes. other may be this curve.
+  void CopyEnabledFrom(PolycurveT other);
+
+ public:
+  // ---- Structural node edits ----
+
+  // Joins the selected open ends, bridging gaps with lines (see
+  // CRV_JoinEnabledAddingLineSegments). Returns whether the join ran (false,
+  // nothing changed, with fewer than two selected open ends).
+  bool JoinEnabledAddingLineSegments();
+  // Breaks the curve at t on the segment that ends at node i (see
+  // CRV_BreakAtLocation). Returns whether it broke; nothing changes on an
+  // empty curve or a position that cannot be broken.
+  bool BreakAt(unsigned long i, double t);
 };
 
 // A handle over arrays that the caller owns and keeps alive as long as any

@@ -74,8 +74,13 @@ int CRV_JoinTwoNodesExt(T* points, NODETYPE* nodes, int n, int a, int b, int* jo
     points[lo] = points[hi] = m;
     nodes[lo] = NODETYPE(nodes[lo] | NodeMask::kClosed);
     nodes[hi] = NODETYPE((nodes[hi] | NodeMask::kClosed) & ~NodeMask::kUser);
+    // The tidy-up drops a stray move in front of each move that follows it
+    // directly (not in a text); the joined node moves down by those in front.
+    int dropped = 0;
+    if (!IsLetterNode(nodes[0]))
+      for (int j = 0; j < lo; ++j) dropped += IsMove(nodes[j]) && IsMove(nodes[j + 1]);
     const int r = OstraCrv::CleansPath(points, nodes, n);
-    if (joined) *joined = lo;
+    if (joined) *joined = lo - dropped;
     return r;
   }
 

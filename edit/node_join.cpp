@@ -271,9 +271,12 @@ int CRV_JoinTwoNodesWithOpenSubpathExt(T* points, NODETYPE* nodes, int n, int* p
   }
   // 5. The positions after both joins.
   if (closing) {
-    *pa = *pc = a2;
-    *pd = d;
-    *pb = b;
+    // b is the subpath's first node and a2, d lie inside it: all moved down
+    // by the stray moves the tidy-up dropped in front.
+    const int shift = b - joinedD;
+    *pa = *pc = a2 - shift;
+    *pd = d - shift;
+    *pb = joinedD;
   } else {
     const int kb = lb3 - fb3 + 1;
     *pa = *pc = a2 > lb3 ? a2 - kb : a2;

@@ -126,6 +126,23 @@ TEST(BreakAtLocation, ClosedSquareOpensAtTheBreak) {
   EXPECT_EQ(s.b, (std::vector<NODETYPE>{0x04, 0x44, 0x44, 0x44}));
 }
 
+TEST(SmoothNode, AlignsHandlesKeepingOrEqualisingTheirLengths) {
+  std::mt19937 rng(45);
+  std::uniform_real_distribution<double> u(-50, 50);
+  for (int k = 0; k < 500; ++k) {
+    const bool symmetric = k % 2;
+    Raw<V> r{{{0, 0}, {u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}, {9, 9}},
+             {0x04, 0xC0, 0xC0, NODETYPE(symmetric ? 0xA4 : 0x94), 0xC0, 0xC0, 0x84}, 7};
+    const V p = r.p[3];
+    const double a = MavikMath::Distance(p, r.p[2]), b = MavikMath::Distance(p, r.p[4]);
+    OstraCrv::SmoothNode(r.p.data(), r.b.data(), 7, 3);
+    EXPECT_NEAR(MavikMath::Cross(r.p[2] - p, r.p[4] - p), 0.0, 1e-9 * (1 + a * b));
+    EXPECT_LT(MavikMath::Dot(r.p[2] - p, r.p[4] - p), 0.0);  // on opposite sides
+    EXPECT_NEAR(MavikMath::Distance(p, r.p[2]), symmetric ? (a + b) / 2 : a, 1e-9);
+    EXPECT_NEAR(MavikMath::Distance(p, r.p[4]), symmetric ? (a + b) / 2 : b, 1e-9);
+  }
+}
+
 TEST(BreakAtLocation, BadInputChangesNothing) {
   std::mt19937 rng(43);
   testpaths::Path path;

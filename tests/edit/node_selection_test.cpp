@@ -58,6 +58,50 @@ TEST(Selection, ClosedEndsAreTwins) {
   EXPECT_EQ(CRV_HowManyEnabledNotFirstOrLastInOpenSubpath(b.data(), 4), 1);
 }
 
+TEST(Selection, EditsKeepTwinsInStepAndRefuseBadInput) {
+  std::mt19937 rng(63);
+  for (int k = 0; k < 2000; ++k) {
+    const testpaths::Path path = testpaths::Make(rng);
+    Bytes b = path.nodes;
+    const int n = path.n();
+    for (int step = 0; step < 6; ++step) {
+      const int i = int(rng() % unsigned(n));
+      switch (rng() % 6) {
+        case 0:  // selects nodes, not control points (an arc's bit is derived)
+          if (!IsArc(b[i])) CRV_SetEnabled(b.data(), n, i, int(rng() % 2));
+          break;
+        case 1: CRV_EnableSubpath(b.data(), n, i, int(rng() % 2)); break;
+        case 2: CRV_EnableAllNodes(b.data(), n); break;
+        case 3: CRV_DisableAllNodes(b.data(), n); break;
+        case 4: CRV_EnableAllControls(b.data(), n); break;
+        default: CRV_EnableOneControl(b.data(), n, i); break;
+      }
+      ASSERT_TRUE(Valid(b)) << k;
+      for (const auto& sp : path.subpaths) {
+        if (!sp.closed) continue;
+        ASSERT_EQ(IsEnabledNode(b[sp.first]), IsEnabledNode(b[sp.last])) << k;
+      }
+    }
+    const Bytes before = b;
+    for (int bad : {-1, n, n + 7}) {
+      EXPECT_EQ(CRV_EnableSubpath(b.data(), n, bad, 1), -1);
+      CRV_EnableOneControl(b.data(), n, bad);
+      CRV_SetEnabled(b.data(), n, bad, 1);
+      EXPECT_EQ(CRV_GetArcBefore(b.data(), n, bad), -1);
+      EXPECT_EQ(CRV_GetArcAfter(b.data(), n, bad), -1);
+    }
+    CRV_DisableAllNodes(b.data(), -n);
+    EXPECT_EQ(CRV_EnableAllNodes(nullptr, n), 0);
+    ASSERT_EQ(b, before) << k;
+  }
+  // The arcs around the closing point of a closed Bezier subpath.
+  const Bytes c = {0x0C, 0xC0, 0xC0, 0x84, 0xC0, 0xC0, 0x88};
+  EXPECT_EQ(CRV_GetArcBefore(c.data(), 7, 0), 5);
+  EXPECT_EQ(CRV_GetArcAfter(c.data(), 7, 6), 1);
+  EXPECT_EQ(CRV_GetArcBefore(c.data(), 7, 3), 2);
+  EXPECT_EQ(CRV_GetArcAfter(c.data(), 7, 0), 1);
+}
+
 // The Beziers that node i (or its twin) starts or ends.
 std::vector<int> ArcsAt(const testpaths::Path& path, int i) {
   std::vector<int> arcs;

@@ -14,27 +14,19 @@
 #include <algorithm>
 #include <cmath>
 
+#include "bezier_common.h"
 #include "ostracrv/math/polynomial.h"
 
 namespace MavikMath::CubicBezier {
 
 namespace {
 
+using internal::PowerOfTwoScale;
+
 constexpr double kStep = 1e-6;
 constexpr double kCluster = 1e-5;
 
 bool AllFinite(const V& a, const V& b, const V& c) noexcept { return a.IsFinite() && b.IsFinite() && c.IsFinite(); }
-
-// A power of two near the largest coefficient magnitude, so that dividing by
-// it is exact and brings the coefficients near 1 (no overflow in products).
-double ScaleOf(const V& a, const V& b, const V& c) noexcept {
-  const double m = std::max({std::fabs(a.x), std::fabs(a.y), std::fabs(b.x), std::fabs(b.y), std::fabs(c.x),
-                             std::fabs(c.y)});
-  if (m == 0.0) return 0.0;
-  int e = 0;
-  std::frexp(m, &e);
-  return std::ldexp(1.0, e);
-}
 
 // Roots in [0, 1] of q2 t^2 + q1 t + q0, ascending; returns the count.
 int AxisRoots(double q2, double q1, double q0, double ts[2]) noexcept {
@@ -81,7 +73,7 @@ D SafeBezierTangent(double t, const V& a, const V& b, const V& c, const V& /*d*/
 
 double SafeBezierCurvature(double t, const V& a, const V& b, const V& c) noexcept {
   if (!std::isfinite(t) || !AllFinite(a, b, c)) return 0.0;
-  const double s = ScaleOf(a, b, c);
+  const double s = PowerOfTwoScale(a, b, c);
   if (s == 0.0) return 0.0;
   if (!(Derivative(a, b, c, t).SquaredLength() > kEpsilon)) t = t + kStep <= 1.0 ? t + kStep : t - kStep;
   // Curvature scales as 1 / size: work on coefficients near 1, then rescale.
@@ -96,7 +88,7 @@ double SafeBezierCurvature(double t, const V& a, const V& b, const V& c) noexcep
 
 bool GetCurvatureRadiusAt(double t, const V& a, const V& b, const V& c, double& radius) noexcept {
   if (!std::isfinite(t) || !AllFinite(a, b, c)) return false;
-  const double s = ScaleOf(a, b, c);
+  const double s = PowerOfTwoScale(a, b, c);
   if (s == 0.0) return false;
   const V sa = a / s, sb = b / s, sc = c / s;
   const D d1 = Derivative(sa, sb, sc, t);
@@ -112,7 +104,7 @@ bool GetCurvatureRadiusAt(double t, const V& a, const V& b, const V& c, double& 
 
 int FindCurvatureMinMax(const V& a0, const V& b0, const V& c0, double* params) noexcept {
   if (!params || !AllFinite(a0, b0, c0)) return 0;
-  const double s = ScaleOf(a0, b0, c0);
+  const double s = PowerOfTwoScale(a0, b0, c0);
   if (s == 0.0) return 0;
   // The parameters of the extrema do not depend on the size of the curve.
   const V a = a0 / s, b = b0 / s, c = c0 / s;

@@ -90,6 +90,21 @@ inline void PointAndDerivatives(const V* q, double t, V& b, D& d1, D& d2) noexce
   d2 = D{6.0 * (s0.x + (s1.x - s0.x) * t), 6.0 * (s0.y + (s1.y - s0.y) * t)};
 }
 
+// De Casteljau's cut at t: out[0..3] is the part before t, out[3..6] the
+// part after, sharing out[3]; the outer points are copied exactly.
+inline void SplitPoints(const V* p, double t, V* out) noexcept {
+  const V q0 = Lerp(p[0], p[1], t), q1 = Lerp(p[1], p[2], t), q2 = Lerp(p[2], p[3], t);
+  const V r0 = Lerp(q0, q1, t), r1 = Lerp(q1, q2, t);
+  const V s = Lerp(r0, r1, t);
+  out[0] = p[0];
+  out[1] = q0;
+  out[2] = r0;
+  out[3] = s;
+  out[4] = r1;
+  out[5] = q2;
+  out[6] = p[3];
+}
+
 inline double Clamp01(double t) noexcept { return t < 0.0 ? 0.0 : (t > 1.0 ? 1.0 : t); }
 
 // Newton's method on g(t) = (B(t) - x) . B'(t), g' = |B'|^2 + (B - x) . B'',
@@ -147,6 +162,26 @@ inline void Range1D(const double* x, double& lo, double& hi) noexcept {
     lo = std::min(lo, v);
     hi = std::max(hi, v);
   }
+}
+
+// Coefficients (ascending) of the numerator of the slope of the signed
+// curvature, up to a positive factor:
+//   N(t) = cross(B', B''') |B'|^2 - 3 cross(B', B'') (B' . B''),
+// of degree at most 5 (its t^6 terms cancel), for B = a t^3 + b t^2 + c t + d.
+// Its roots include every curvature extremum and every cusp.
+inline void CurvatureSlopePolynomial(const V& a, const V& b, const V& c, double n[6]) noexcept {
+  const double axb = Cross(a, b), cxa = Cross(c, a), cxb = Cross(c, b);
+  const double aa = Dot(a, a), ab = Dot(a, b), ac = Dot(a, c), bb = Dot(b, b), bc = Dot(b, c), cc = Dot(c, c);
+  const double crossD1D3[2] = {6.0 * cxa, -12.0 * axb};                                // cross(B', B''')
+  const double speed2[5] = {cc, 4.0 * bc, 4.0 * bb + 6.0 * ac, 12.0 * ab, 9.0 * aa};  // |B'|^2
+  const double crossD1D2[3] = {2.0 * cxb, 6.0 * cxa, -6.0 * axb};                     // cross(B', B'')
+  const double dotD1D2[4] = {2.0 * bc, 4.0 * bb + 6.0 * ac, 18.0 * ab, 18.0 * aa};    // B' . B''
+  double p1[6] = {}, p2[6] = {};
+  for (int i = 0; i < 2; ++i)
+    for (int j = 0; j < 5; ++j) p1[i + j] += crossD1D3[i] * speed2[j];
+  for (int i = 0; i < 3; ++i)
+    for (int j = 0; j < 4; ++j) p2[i + j] += crossD1D2[i] * dotD1D2[j];
+  for (int i = 0; i < 6; ++i) n[i] = p1[i] - 3.0 * p2[i];
 }
 
 // Coefficients (ascending) of g(t) = B(t) . B'(t) for the curve q, the

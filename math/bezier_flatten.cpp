@@ -15,13 +15,13 @@
 
 #include "bezier_common.h"
 #include "ostracrv/math/bezier_basis.h"
-#include "ostracrv/math/bezier_split.h"
 
 namespace MavikMath {
 
 namespace {
 
 using CubicBezier::internal::LoadFinite;
+using CubicBezier::internal::SplitPoints;
 using Framework::common_types::POINT;
 using Framework::common_types::RECT;
 
@@ -58,10 +58,10 @@ bool Flatten(const V* p, double tol, Emit&& emit) noexcept {
     const bool lastPiece = top == 0;
     const double k = Steps(piece.q, tol);
     if (k > 1.0 && piece.depth < kMaxDepth) {
-      Piece left, right;
-      CubicBezier::Split(0.5, piece.q, left.q, right.q);
+      V o[7];
+      SplitPoints(piece.q, 0.5, o);
+      const Piece left{{o[0], o[1], o[2], o[3]}, piece.depth + 1}, right{{o[3], o[4], o[5], o[6]}, piece.depth + 1};
       if (Steps(left.q, tol) + Steps(right.q, tol) < k) {
-        left.depth = right.depth = piece.depth + 1;
         stack[top++] = right;
         stack[top++] = left;
         continue;

@@ -36,7 +36,6 @@
 #include <cmath>
 
 #include "bezier_common.h"
-#include "ostracrv/math/bezier_derivatives.h"
 #include "ostracrv/math/bezier_split.h"
 #include "ostracrv/math/least_squares.h"
 #include "ostracrv/math/polynomial.h"
@@ -166,6 +165,16 @@ int Cusps(const Unit& u, double* out) noexcept {
   return m;
 }
 
+// Curvature extrema and cusps: every root of the slope of the curvature.
+// Not FindCurvatureMinMax: these only end stretches of the search below,
+// where a spare root (a flat point of the curvature) does no harm; its
+// merging and sign tests are not needed and cost the cutting a few per cent.
+int CurvatureExtrema(const Unit& u, double* out) noexcept {
+  double n[6];
+  CubicBezier::internal::CurvatureSlopePolynomial(u.a, u.b, u.c, n);
+  return FindRootsInInterval(n, 5, 0.0, 1.0, out);
+}
+
 // Sign of h near t, looking towards `other` where B' vanishes at t (h is 0
 // at a cusp, but its sign next to it is that of -d kappa).
 int SignNear(const Unit& u, double t, double other) noexcept {
@@ -191,7 +200,7 @@ int OffsetCusps(const Unit& u, double* out) noexcept {
     if (cusps[i] - kCuspZone > 0.0) ends[n++] = cusps[i] - kCuspZone;
     if (cusps[i] + kCuspZone < 1.0) ends[n++] = cusps[i] + kCuspZone;
   }
-  n += CubicBezier::FindCurvatureMinMax(u.a, u.b, u.c, &ends[n]);  // cusps included
+  n += CurvatureExtrema(u, &ends[n]);
   for (int k = 1; k < kSafetySteps; ++k) ends[n++] = double(k) / kSafetySteps;
   std::sort(ends.begin(), ends.begin() + n);
   int m = 0;

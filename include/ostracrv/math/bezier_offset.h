@@ -25,7 +25,7 @@
 //   |B'|^2 <= kCuspSpeedSqr.
 // - Offset cusps: roots of h(t) = |B'|^3 - d cross(B', B''), which has the
 //   sign of 1 - d kappa. The parameter range is cut at the inflections, cusps
-//   and curvature extrema (FindCurvatureMinMax: sign changes of the quintic
+//   and curvature extrema (roots of the quintic
 //   cross(B', B''') |B'|^2 - 3 cross(B', B'') (B'.B''), the derivative of
 //   kappa up to a positive factor) and at sixteenths as a safety net; on each
 //   stretch kappa is monotone, so h changes sign at most once and bisection

@@ -65,7 +65,7 @@ TEST(FindBezierOffsetCurve, AcceptedCurvesStayWithinToleranceOfTheTrueOffset) {
       for (const Accepted& a : out) {
         ++accepted;
         ASSERT_LT(WorstDeviationSq(a, d), tol * tol) << "trial " << trial;
-        // Ends are the exact offsets of the ends; end tangents parallel.
+        // Ends are the exact offsets of the ends.
         EXPECT_LT(Distance(a.result[0], TrueOffset(a.source.data(), d, 0)), 1e-9 * (100 + std::fabs(d)));
         EXPECT_LT(Distance(a.result[3], TrueOffset(a.source.data(), d, 1)), 1e-9 * (100 + std::fabs(d)));
       }

@@ -74,8 +74,10 @@ struct IntersectionCurveT {
   std::vector<int> intersectsWith;  // the curves it meets, without duplicates
 
   IntersectionCurveT() = default;
-  IntersectionCurveT(T const* points_, NODETYPE const* nodes_, int count_, bool active_, bool selfTest_)
-      : points(points_), nodes(nodes_), count(count_), active(active_), selfTest(selfTest_) {}
+  IntersectionCurveT(T const* points_, NODETYPE const* nodes_, int count_, bool active_, bool selfTest_,
+                     bool callerMark_ = false)
+      : points(points_), nodes(nodes_), count(count_), active(active_), selfTest(selfTest_),
+        callerMark(callerMark_) {}
 
   // Adds curve to intersectsWith unless it is there (a linear search).
   void SetIntersectsWith(int curve) {

@@ -1,21 +1,18 @@
 // Helpers of the intersection engine tests: building raw paths, running the
 // engine, snapshots of its records for exact comparison, an invariant check
-// with an independent curve evaluation, and a small reader of SVG path data
-// (absolute M, L, C, Z) for the real shapes of the corpus.
+// with an independent curve evaluation, and the real shapes of the corpus.
 #pragma once
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cctype>
 #include <cmath>
-#include <cstdio>
 #include <fstream>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "ostracrv/intersect/segments.h"
+#include "ostracrv/io/svg_path.h"
 
 namespace engine_test {
 
@@ -202,62 +199,22 @@ inline SegmentIntersectionSettings Settings(double end, double touch) {
   return s;
 }
 
-// SVG path data with absolute M, L, C and Z (and implicit lines after M).
-// A subpath that returns to its start without Z is closed as well.
-inline Path<V> ParseSvgPath(const std::string& data) {
-  Path<V> path;
-  std::string text = data;
-  for (char& c : text)
-    if (c == ',') c = ' ';
-  std::istringstream in(text);
-  char command = 0;
-  auto number = [&](double& v) -> bool {
-    in >> std::ws;
-    const int c = in.peek();
-    if (c == EOF || std::isalpha(c)) return false;
-    return static_cast<bool>(in >> v);
-  };
-  auto finish = [&] {
-    if (path.subpathStart >= 0 && path.size() - path.subpathStart > 1 &&
-        path.points.back() == path.points[path.subpathStart] && (path.nodes[path.subpathStart] & 0x08) == 0)
-      path.Close();
-  };
-  while (in >> std::ws, in.peek() != EOF) {
-    if (std::isalpha(in.peek())) in >> command;
-    if (command == 'Z' || command == 'z') {
-      if (path.subpathStart >= 0 && (path.nodes[path.subpathStart] & 0x08) == 0) path.Close();
-      command = 0;
-      continue;
-    }
-    double v[6];
-    if (command == 'M') {
-      if (!number(v[0]) || !number(v[1])) break;
-      finish();
-      path.Move(V{v[0], v[1]});
-      command = 'L';
-    } else if (command == 'L') {
-      if (!number(v[0]) || !number(v[1])) break;
-      path.Line(V{v[0], v[1]});
-    } else if (command == 'C') {
-      for (double& x : v)
-        if (!number(x)) return path;
-      path.Cubic(V{v[0], v[1]}, V{v[2], v[3]}, V{v[4], v[5]});
-    } else {
-      break;
-    }
-  }
-  finish();
-  return path;
-}
-
-// The two operands of a corpus file (two lines of path data), or none if
+// The two operands of a corpus file (two lines of SVG path data), or none if
 // the file is missing.
 inline std::vector<Path<V>> ReadCorpusPair(const std::string& file) {
   std::ifstream in(file);
   std::vector<Path<V>> out;
   std::string line;
-  while (std::getline(in, line))
-    if (!line.empty()) out.push_back(ParseSvgPath(line));
+  while (std::getline(in, line)) {
+    OstraCrv::PolycurveT<V> curve;
+    if (line.empty() || !OstraCrv::ParseSvgPathData(line, curve)) continue;
+    Path<V> p;
+    const V* pts = curve.GetPoints();
+    const NODETYPE* nodes = curve.GetNodeTypes();
+    p.points.assign(pts, pts + curve.GetPointCount());
+    p.nodes.assign(nodes, nodes + curve.GetPointCount());
+    out.push_back(p);
+  }
   return out;
 }
 

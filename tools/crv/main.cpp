@@ -21,6 +21,9 @@ const char* const kHelp =
     "                                bounds of every path and subpath\n"
     "  render FILE.svg -o OUT.svg    draw the paths with nodes, control points and handles\n"
     "                                marked (--png also writes a PNG)\n"
+    "  intersect-points A.svg [B.svg] [-o OUT.svg]\n"
+    "                                crossings, touches and shared stretches of the\n"
+    "                                paths, listed (and drawn with -o)\n"
     "  help [COMMAND]                this text, or the help of one command\n"
     "\n"
     "'crv COMMAND --help' shows the help of a command.\n"
@@ -45,6 +48,7 @@ int main(int argc, char** argv) {
   args.erase(args.begin());
   if (command == "info") return crv::RunInfo(args);
   if (command == "render") return crv::RunRender(args);
+  if (command == "intersect-points") return crv::RunIntersectPoints(args);
   if (command == "help" || command == "--help" || command == "-h") {
     if (args.empty()) {
       std::cout << kHelp;
@@ -56,6 +60,10 @@ int main(int argc, char** argv) {
     }
     if (args[0] == "render") {
       std::cout << crv::kRenderHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "intersect-points") {
+      std::cout << crv::kIntersectPointsHelp;
       return crv::kOk;
     }
     std::cerr << "crv help: unknown command '" << args[0] << "'\n";

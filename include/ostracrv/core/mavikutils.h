@@ -91,6 +91,8 @@ class RangeView {
   It begin() const { return begin_; }
   It end() const { return end_; }
   bool empty() const { return !(begin_ != end_); }
+  // The resource the range keeps alive (may be null).
+  const std::shared_ptr<const void>& keep_alive() const { return keep_; }
 
  private:
   It begin_{};
@@ -106,7 +108,8 @@ inline RangeView<IndexT<unsigned long>> Indices(unsigned long first, unsigned lo
 // advances by Next. The iterator is at its end when the getter yields no
 // value or the state reaches the end state.
 //   Getter: optional<Value> operator()(const State&) const
-//   Next:   void operator()(State&) const
+//   Next:   void operator()(State&) const, or State operator()(State) const
+//           that returns the next state
 template <class Getter, class Next>
 class factory_iterator_t {
  public:
@@ -128,7 +131,10 @@ class factory_iterator_t {
   reference operator*() const { return *value_; }
   pointer operator->() const { return &*value_; }
   factory_iterator_t& operator++() {
-    next_(state_);
+    if constexpr (std::is_void_v<std::invoke_result_t<const Next&, state_type&>>)
+      next_(state_);
+    else
+      state_ = next_(state_);
     Load();
     return *this;
   }
@@ -155,12 +161,18 @@ class factory_iterator_t {
 };
 
 // A range without its first element (a subpath walk without its move view).
+// A resource kept alive by the source range (such as the copy of a curve
+// that a segment walk reads) is kept alive by the result too, so that the
+// result of skip_first on a temporary range stays valid.
 template <class Range>
 auto skip_first(const Range& r) {
   auto b = r.begin();
   auto e = r.end();
   if (b != e) ++b;
-  return RangeView<decltype(b)>(b, e);
+  if constexpr (requires { r.keep_alive(); })
+    return RangeView<decltype(b)>(b, e, r.keep_alive());
+  else
+    return RangeView<decltype(b)>(b, e);
 }
 
 }  // namespace MavikUtils

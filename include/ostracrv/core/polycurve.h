@@ -33,8 +33,11 @@
 
 #include "ostracrv/core/common_types.h"
 #include "ostracrv/core/curvedata.h"
+#include "ostracrv/core/curveposition.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
+#include "ostracrv/math/matrix.h"
+#include "ostracrv/math/rect.h"
 #include "ostracrv/math/vector2d.h"
 
 namespace OstraCrv {
@@ -244,6 +247,85 @@ class PolycurveT {
   // Appends m entries, copying shared storage once into arrays of the final
   // length. The arguments have been checked.
   void Append(T const* points, NODETYPE const* nodes, unsigned long m);
+
+ public:
+  // ---- Measurement ----
+  // Thin wrappers over the raw measures of the measure/ headers (bounds.h,
+  // area.h, length.h, pointoncurve.h, tangents.h) on this curve's arrays;
+  // each answers what its raw form answers for bad input.
+
+  // Tight box around the true shape, rounded outward; empty for an empty
+  // curve.
+  Framework::common_types::RECT GetTightBBox() const;
+  // Box of all points, control points included, rounded outward.
+  Framework::common_types::RECT GetLooseBBox() const;
+  // Tight box of the segments that touch an enabled node; empty if none.
+  Framework::common_types::RECT GetTightEnabledBBox() const;
+  // Tight box after the transform, in doubles.
+  MavikMath::BoundsT<double> GetTightTransformedBBox(MavikMath::MATRIX const& m) const;
+  // Box of every point (control points included) after the transform.
+  MavikMath::BoundsT<double> GetLooseTransformedBBox(MavikMath::MATRIX const& m) const;
+  // Signed area of the closed subpaths, positive for clockwise (y up).
+  double GetArea() const;
+  // Length of all segments, at accuracy 10.
+  double GetLength() const;
+  // The point at t on the segment that ends at node i (rounded for integer
+  // curves); the zero point, or false, where that segment does not exist.
+  T GetPointOnCurve(unsigned long i, double t) const;
+  bool GetPointOnCurve(unsigned long i, double t, T& out) const;
+  // The same at a position's end node and t; the zero point, or false, for a
+  // position whose segment is negative.
+  T GetPointOnCurve(CurvePosition const& pos) const;
+  bool GetPointOnCurve(CurvePosition const& pos, T& out) const;
+  // In doubles without rounding, for an integer curve.
+  bool GetPointOnCurve(unsigned long i, double t, MavikMath::V& out) const
+    requires(!std::is_same_v<T, MavikMath::V>);
+  // In doubles without rounding; the zero point where there is no segment.
+  MavikMath::V GetPoint2dOnCurve(unsigned long i, double t) const;
+  // Some point on the curve: the middle of the first segment if node 1 is a
+  // line or node 3 a curve; otherwise the zero point.
+  T GetPointOnCurve() const;
+  // Derivative at t of the segment ending at i; see tangents.h.
+  MavikMath::D GetTangentAt(unsigned long i, double t, bool normalise) const;
+  // Direction in which the curve leaves node i, or arrives from behind it
+  // (pointing away from i); (0, 0) where there is none.
+  MavikMath::D GetForwardTangentAt(int i) const;
+  MavikMath::D GetReverseTangentAt(int i) const;
+  // Signed curvature just after / just before node i, positive for a left
+  // turn; 0.0 on lines and where there is no segment.
+  double GetForwardCurvatureAt(int i) const;
+  double GetReverseCurvatureAt(int i) const;
+  // Whether the segment ending at i passes centre clockwise at t; tangent,
+  // if not null, receives the direction of travel there.
+  bool IsClockwise(unsigned long i, double t, T const& centre, MavikMath::D* tangent) const;
+  // Whether node i is a corner: marked cusp and its two sides not opposite.
+  bool IsCuspNode(unsigned long i) const;
+  // The number of line and curve nodes.
+  int GetNumberOfSegments() const;
+  // True if the curve is not empty and holds only move and line nodes.
+  bool AllLineSegments() const;
+
+ public:
+  // ---- Closest points ----
+  // See closest.h for the searches.
+
+  // The nearest point of the curve to p; false, out unchanged, if the curve
+  // has no segment or p is not finite.
+  bool FindClosestPoint(T p, ClosestPoint<T, CurvePosition>& out) const;
+  // The nearest end of an open subpath of more than one node: node is set to
+  // 0, then to that end's index; true if such an end exists.
+  bool FindClosestOpenPoint(T p, unsigned long& node) const;
+  // Whether the nearest point of the curve lies within tolerance of p
+  // (squared distance at most tolerance squared). False for an empty curve,
+  // a curve without segments or non-finite input.
+  bool IsPointOnCurve(T const& p, double tolerance) const;
+  // The length from the start of the curve to its nearest point to p; 0.0
+  // if there is none.
+  double GetLengthAlongCurveTo(T p) const;
+  // The length from the start of the curve, across subpaths, to t on the
+  // segment ending at endNode; and from there to the end of the curve.
+  double GetLengthAlongCurveTo(unsigned long endNode, double t) const;
+  double GetLengthFrom(unsigned long endNode, double t) const;
 };
 
 // A handle over arrays that the caller owns and keeps alive as long as any

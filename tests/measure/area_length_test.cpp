@@ -1,0 +1,193 @@
+// Area and length against fine flattenings of random paths (shoelace sum and
+// polyline length), against circles, and under reversal.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <numbers>
+
+#include "measure/sampled_paths.h"
+
+namespace {
+
+using Framework::common_types::POINT;
+using MavikMath::V;
+using OstraCrv::PolycurveT;
+
+template <class T>
+class AreaLength : public ::testing::Test {};
+using PointKinds = ::testing::Types<POINT, V>;
+TYPED_TEST_SUITE(AreaLength, PointKinds);
+
+constexpr int kSteps = 4000;
+
+TYPED_TEST(AreaLength, AgreeWithFineFlattening) {
+  using T = TypeParam;
+  std::mt19937 rng(20240611);
+  for (int round = 0; round < 60; ++round) {
+    const auto p = sampled::Make<T>(rng);
+    double area = 0.0, scale = 0.0, length = 0.0;
+    for (int s = 0; s < int(p.shape.subpaths.size()); ++s) {
+      double sub = 0.0;
+      for (const auto& seg : p.shape.segments) {
+        if (seg.subpath != s) continue;
+        const auto pts = sampled::Sample(p, seg, seg.bezier ? kSteps : 1);
+        for (size_t k = 1; k < pts.size(); ++k) {
+          sub += (pts[k - 1].y + pts[k].y) * (pts[k].x - pts[k - 1].x) * 0.5;
+          length += MavikMath::Distance(pts[k - 1], pts[k]);
+        }
+      }
+      if (p.shape.subpaths[s].closed) {
+        area += sub;
+        scale += std::fabs(sub);
+      }
+    }
+    EXPECT_NEAR(p.curve.GetArea(), area, 1e-6 * scale + 1e-6) << "round " << round;
+    EXPECT_NEAR(p.curve.GetLength(), length, 1e-6 * length) << "round " << round;
+  }
+}
+
+// A clockwise rectangle (y up) in the corner order of a RECT and of bounds.
+template <class T>
+PolycurveT<T> Rectangle(double l, double b, double r, double t) {
+  auto P = [](double x, double y) { return MavikMath::FromV<T>(V{x, y}); };
+  const T pts[] = {P(l, b), P(l, t), P(r, t), P(r, b), P(l, b)};
+  const NODETYPE nodes[] = {NodeTypes::Closed::move, NodeTypes::Open::line, NodeTypes::Open::line,
+                            NodeTypes::Open::line, NodeTypes::Closed::line};
+  return PolycurveT<T>(pts, nodes, 5);
+}
+
+TEST(AreaSigns, RectangleIsPositiveInBothKinds) {
+  const double a = Rectangle<POINT>(-3, -2, 7, 5).GetArea();
+  EXPECT_DOUBLE_EQ(a, 70.0);
+  EXPECT_DOUBLE_EQ(Rectangle<V>(-3, -2, 7, 5).GetArea(), a);
+}
+
+TYPED_TEST(AreaLength, OpenSubpathsDoNotCount) {
+  using T = TypeParam;
+  const T tri[] = {T{0, 0}, T{0, 4}, T{3, 0}, T{0, 0}};
+  const NODETYPE open[] = {NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::line, NodeTypes::Open::line};
+  const NODETYPE closed[] = {NodeTypes::Closed::move, NodeTypes::Open::line, NodeTypes::Open::line,
+                             NodeTypes::Closed::line};
+  EXPECT_EQ(OstraCrv::GetArea(tri, open, 4), 0.0);
+  EXPECT_DOUBLE_EQ(OstraCrv::GetArea(tri, closed, 4), 6.0);  // clockwise with y up
+  // One closed and one open subpath: only the closed one counts.
+  PolycurveT<T> both(tri, closed, 4);
+  both.PushBack(tri, open, 4);
+  EXPECT_DOUBLE_EQ(both.GetArea(), 6.0);
+  // The polygon form leaves the closing edge out: the area under two edges.
+  const POINT poly[] = {{0, 0}, {0, 4}, {3, 0}};
+  EXPECT_DOUBLE_EQ(OstraCrv::GetPolygonArea(poly, 3), 6.0);
+  EXPECT_EQ(OstraCrv::GetPolygonArea(poly, 1), 0.0);
+  // Bad input.
+  EXPECT_EQ(OstraCrv::GetArea<T>(nullptr, closed, 4), 0.0);
+  EXPECT_EQ(OstraCrv::GetArea(tri, closed, 1), 0.0);
+  EXPECT_EQ(OstraCrv::GetLength<T>(tri, nullptr, 4), 0.0);
+  EXPECT_EQ(PolycurveT<T>().GetLength(), 0.0);
+  EXPECT_DOUBLE_EQ(OstraCrv::GetLength(tri, 4), 12.0);  // polyline 4 + 5 + 3
+}
+
+TEST(AreaLengthBadInput, NaNGivesZeroNotNaN) {
+  const double nan = std::nan("");
+  const V pts[] = {{0, 0}, {nan, 1}, {2, 2}, {0, 0}};
+  const NODETYPE nodes[] = {NodeTypes::Closed::move, NodeTypes::Open::line, NodeTypes::Open::line,
+                            NodeTypes::Closed::line};
+  EXPECT_EQ(OstraCrv::GetArea(pts, nodes, 4), 0.0);
+  EXPECT_EQ(OstraCrv::GetLength(pts, nodes, 4), 0.0);
+  EXPECT_EQ(OstraCrv::GetLengthAlongCurveTo(pts, nodes, 4, 3, nan), 0.0);
+}
+
+// Four Bezier quarters with the usual handle factor, counter-clockwise.
+template <class T>
+PolycurveT<T> Circle(double r) {
+  const double k = 0.5522847498 * r;
+  auto P = [](double x, double y) { return MavikMath::FromV<T>(V{x, y}); };
+  const T pts[] = {P(r, 0),   P(r, k),   P(k, r),  P(0, r),  P(-k, r), P(-r, k), P(-r, 0),
+                   P(-r, -k), P(-k, -r), P(0, -r), P(k, -r), P(r, -k), P(r, 0)};
+  std::vector<NODETYPE> nodes = {WithContinuity(NodeTypes::Closed::move, ContinuityType::smooth)};
+  for (int q = 0; q < 4; ++q) {
+    nodes.push_back(NodeTypes::arc);
+    nodes.push_back(NodeTypes::arc);
+    nodes.push_back(q == 3 ? NodeTypes::Closed::smoothCurve : NodeTypes::Open::smoothCurve);
+  }
+  return PolycurveT<T>(pts, nodes.data(), 13);
+}
+
+TYPED_TEST(AreaLength, CircleMatchesWithinTheFourArcError) {
+  using T = TypeParam;
+  const double r = 1000.0, pi = std::numbers::pi;
+  const auto c = Circle<T>(r);
+  ASSERT_TRUE(OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount()));
+  EXPECT_NEAR(c.GetArea(), -pi * r * r, 1e-3 * pi * r * r);  // counter-clockwise: negative
+  EXPECT_NEAR(c.GetLength(), 2 * pi * r, 1e-3 * r);
+  // A quarter arc alone.
+  EXPECT_NEAR(OstraCrv::GetLength(c.GetPoints(), c.GetNodeTypes(), 4), pi * r / 2, 1e-3 * r);
+  // The curvature is positive (a left turn) at every node, close to 1/r.
+  for (int i = 0; i < 12; i += 3) {
+    EXPECT_GT(c.GetForwardCurvatureAt(i), 0.0);
+    EXPECT_NEAR(c.GetForwardCurvatureAt(i), 1.0 / r, 0.05 / r);  // ends of a quarter: -2.1%
+    EXPECT_GT(c.GetReverseCurvatureAt(i + 3), 0.0);
+  }
+}
+
+TYPED_TEST(AreaLength, StraightBezierHasItsChordLength) {
+  using T = TypeParam;
+  const T pts[] = {T{0, 0}, T{1, 0}, T{2, 0}, T{3, 0}};
+  const NODETYPE nodes[] = {NodeTypes::Open::move, NodeTypes::arc, NodeTypes::arc, NodeTypes::Open::curve};
+  EXPECT_NEAR(OstraCrv::GetLength(pts, nodes, 4), 3.0, 1e-12);
+}
+
+// Reversing a closed subpath (points backwards, Beziers turned around)
+// flips the sign of the area and keeps the length.
+TYPED_TEST(AreaLength, ReversalFlipsAreaKeepsLength) {
+  using T = TypeParam;
+  std::mt19937 rng(99);
+  for (int round = 0; round < 40; ++round) {
+    const auto p = sampled::Make<T>(rng, 1000, 1, 8);
+    const auto& sp = p.shape.subpaths[0];
+    if (!sp.closed) continue;
+    std::vector<T> pts(p.points.rbegin(), p.points.rend());
+    std::vector<NODETYPE> nodes(pts.size());
+    // Node k of the reversed path plays the role of node n-1-k; a segment
+    // ending at e forwards ends at its start node backwards.
+    nodes[0] = NodeTypes::Closed::move;
+    for (const auto& seg : p.shape.segments) {
+      const int end = p.shape.n() - 1 - seg.start;
+      if (seg.bezier) {
+        nodes[end - 2] = nodes[end - 1] = NodeTypes::arc;
+        nodes[end] = NodeTypes::Open::curve;
+      } else {
+        nodes[end] = NodeTypes::Open::line;
+      }
+    }
+    nodes.back() = IsCurve(nodes.back()) ? NodeTypes::Closed::curve : NodeTypes::Closed::line;
+    PolycurveT<T> rev(pts.data(), nodes.data(), pts.size());
+    ASSERT_TRUE(OstraCrv::IsValidCurve(nodes.data(), nodes.size()));
+    EXPECT_NEAR(rev.GetArea(), -p.curve.GetArea(), 1e-9 * (1 + std::fabs(p.curve.GetArea())));
+    EXPECT_NEAR(rev.GetLength(), p.curve.GetLength(), 1e-8 * p.curve.GetLength());
+  }
+}
+
+// Length up to a position plus length from it is the whole, at every end
+// node; along a line the part grows linearly with t.
+TYPED_TEST(AreaLength, PartialLengthsAddUp) {
+  using T = TypeParam;
+  std::mt19937 rng(7);
+  for (int round = 0; round < 40; ++round) {
+    const auto p = sampled::Make<T>(rng);
+    const double whole = p.curve.GetLength();
+    for (const auto& seg : p.shape.segments) {
+      const unsigned long e = seg.end;
+      EXPECT_NEAR(p.curve.GetLengthAlongCurveTo(e, 1.0) + p.curve.GetLengthFrom(e, 1.0), whole, 1e-8 * whole);
+      EXPECT_NEAR(p.curve.GetLengthAlongCurveTo(e, 0.3) + p.curve.GetLengthFrom(e, 0.3), whole, 1e-8 * whole);
+      const double before = p.curve.GetLengthAlongCurveTo(e, 0.0);
+      const double segLength = p.curve.GetLengthAlongCurveTo(e, 1.0) - before;
+      if (!seg.bezier) {
+        EXPECT_NEAR(p.curve.GetLengthAlongCurveTo(e, 0.25) - before, 0.25 * segLength, 1e-9 * whole);
+      }
+    }
+    EXPECT_EQ(p.curve.GetLengthFrom(p.curve.GetPointCount(), 0.0), 0.0);
+    EXPECT_NEAR(p.curve.GetLengthAlongCurveTo(~0ul, 0.5), whole, 1e-8 * whole);
+  }
+}
+
+}  // namespace

@@ -9,6 +9,7 @@
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/core/polycurve.h"
+#include "ostracrv/io/svg_path.h"
 #include "ostracrv/math/angles.h"
 #include "ostracrv/math/bezier_area.h"
 #include "ostracrv/math/bezier_basis.h"

@@ -1,0 +1,63 @@
+# Runs the crv tool the way a user does and checks its exit statuses and
+# messages: 0 on success, 2 on a bad command line, 1 on unreadable input.
+# Invoked by CTest as: cmake -DCRV=... -DSAMPLES=... -DWORK=... -P cli_test.cmake
+file(REMOVE_RECURSE ${WORK})
+file(MAKE_DIRECTORY ${WORK})
+set(failures 0)
+
+# expect(STATUS PATTERN ARGS...): runs crv ARGS, checks the exit status and
+# that standard output or error matches PATTERN ("" for any).
+function(expect status pattern)
+  execute_process(COMMAND ${CRV} ${ARGN} RESULT_VARIABLE rc OUTPUT_VARIABLE out ERROR_VARIABLE err)
+  if(NOT rc STREQUAL "${status}")
+    message(SEND_ERROR "crv ${ARGN}: exit status ${rc}, expected ${status}\n${out}${err}")
+  elseif(NOT pattern STREQUAL "" AND NOT "${out}${err}" MATCHES "${pattern}")
+    message(SEND_ERROR "crv ${ARGN}: output does not match '${pattern}':\n${out}${err}")
+  endif()
+endfunction()
+
+file(WRITE ${WORK}/broken.svg "<svg><path d='M0 0'></svg>")
+file(WRITE ${WORK}/notsvg.svg "<html/>")
+file(WRITE ${WORK}/baddata.svg "<svg viewBox='0 0 10 10'><path d='M1 1 L5 5 L'/></svg>")
+
+# Success.
+expect(0 "usage: crv" help)
+expect(0 "usage: crv info" help info)
+expect(0 "usage: crv render" help render)
+expect(0 "usage: crv info" info --help)
+expect(0 "usage: crv render" render -h)
+expect(0 "shape 1: <path id=\"ring\">.*subpath 2: closed" info ${SAMPLES}/ring.svg)
+expect(0 "fill-rule evenodd" info ${SAMPLES}/groups.svg)
+expect(0 "" info --precision 4 ${SAMPLES}/letter.svg)
+expect(0 "" render ${SAMPLES}/overlap.svg -o ${WORK}/overlap.svg)
+expect(0 "" render ${SAMPLES}/letter.svg --output=${WORK}/letter.svg)
+# Geometry read up to a path data error still counts as read.
+expect(0 "baddata.svg: line 1: <path> d: expected a number at offset 11" info ${WORK}/baddata.svg)
+
+# Bad usage.
+expect(2 "usage: crv")
+expect(2 "unknown command 'frobnicate'" frobnicate)
+expect(2 "unknown command" help frobnicate)
+expect(2 "expects exactly one FILE" info)
+expect(2 "expects exactly one FILE" info a.svg b.svg)
+expect(2 "unknown option --bogus" info --bogus ${SAMPLES}/ring.svg)
+expect(2 "--precision" info --precision x ${SAMPLES}/ring.svg)
+expect(2 "needs an output file" render ${SAMPLES}/ring.svg)
+expect(2 "option --output needs a value" render ${SAMPLES}/ring.svg -o)
+
+# Unreadable input: one line naming the file and the problem.
+expect(1 "crv: ${WORK}/missing.svg: cannot open file" info ${WORK}/missing.svg)
+expect(1 "crv: ${WORK}/broken.svg: not well-formed XML" info ${WORK}/broken.svg)
+expect(1 "crv: ${WORK}/notsvg.svg: root element is <html>" render ${WORK}/notsvg.svg -o ${WORK}/x.svg)
+expect(1 "cannot write file" render ${SAMPLES}/ring.svg -o ${WORK}/no/such/dir/out.svg)
+
+# The rendered file is an SVG document that crv itself reads back: the
+# drawing's shapes, the legend and the markers.
+expect(0 "shapes" info ${WORK}/overlap.svg)
+file(READ ${WORK}/overlap.svg rendered)
+foreach(part "<path id=\"disc\"" "<path id=\"star\"" "id=\"handles\"" "id=\"nodes\"" "closed start")
+  string(FIND "${rendered}" "${part}" at)
+  if(at EQUAL -1)
+    message(SEND_ERROR "rendered file lacks ${part}")
+  endif()
+endforeach()

@@ -1,0 +1,121 @@
+// crv info: what the library sees in each path of an SVG file.
+//
+// Per shape a summary line and per subpath one line: nodes the user sees,
+// points stored, segments, closed or open, validity of the node bytes, and
+// the measurements of the library in library coordinates (y up).
+#include <cstdio>
+#include <iostream>
+#include <sstream>
+
+#include "common.h"
+#include "polycurve.h"
+
+namespace crv {
+
+const char* const kInfoHelp =
+    "usage: crv info FILE.svg [--precision N]\n"
+    "\n"
+    "Prints, for every path of the file (path, rect, circle, ellipse, line,\n"
+    "polyline and polygon elements, with their transforms applied) and for each\n"
+    "of its subpaths: the nodes a user sees, the points stored (nodes plus\n"
+    "Bezier control points and the repeated closing point), the segments, whether\n"
+    "it is closed, whether its node bytes are valid, its area, its length and\n"
+    "its tight bounds.\n"
+    "\n"
+    "Coordinates have y pointing up (the document is mirrored through the middle\n"
+    "of its view box); the area is positive for a subpath drawn clockwise on\n"
+    "screen and negative for one drawn counter-clockwise. A shape's area is the\n"
+    "sum over its subpaths.\n"
+    "\n"
+    "options:\n"
+    "  --precision N   significant digits of the numbers (default 8)\n"
+    "  -h, --help      this text\n";
+
+namespace {
+
+using MavikMath::V;
+
+struct Counts {
+  int userNodes = 0, points = 0, segments = 0;
+  bool valid = false;
+};
+
+Counts Count(V const* pts, NODETYPE const* nodes, int n) {
+  (void)pts;
+  Counts c;
+  c.userNodes = CRV_GetNumberOfUserNodes(nodes, unsigned(n), false);
+  c.points = n;
+  c.segments = OstraCrv::GetSegmentCount(nodes, n);
+  c.valid = OstraCrv::IsValidCurve(nodes, (unsigned long)n);
+  return c;
+}
+
+std::string Describe(const Counts& c) {
+  std::ostringstream s;
+  s << c.userNodes << (c.userNodes == 1 ? " node, " : " nodes, ") << c.points
+    << (c.points == 1 ? " point, " : " points, ") << c.segments << (c.segments == 1 ? " segment" : " segments")
+    << ", " << (c.valid ? "valid" : "INVALID");
+  return s.str();
+}
+
+}  // namespace
+
+int RunInfo(const std::vector<std::string>& argv) {
+  Args args;
+  std::string message;
+  if (!args.Parse(argv, {"--precision"}, {}, message)) return UsageError("info", message);
+  if (args.help) {
+    std::cout << kInfoHelp;
+    return kOk;
+  }
+  if (args.positional.size() != 1) return UsageError("info", "expects exactly one FILE.svg");
+  int digits = 8;
+  if (args.Has("--precision")) {
+    try {
+      std::size_t used = 0;
+      digits = std::stoi(args.Value("--precision"), &used);
+      if (used != args.Value("--precision").size() || digits < 1 || digits > 17) throw 0;
+    } catch (...) {
+      return UsageError("info", "--precision takes a whole number from 1 to 17");
+    }
+  }
+  const std::string& file = args.positional[0];
+  OstraCrv::svgdoc::Document doc;
+  if (!LoadDocument(file, doc)) return kInputError;
+
+  const auto& f = doc.frame;
+  std::cout << file << ": " << doc.shapes.size() << (doc.shapes.size() == 1 ? " shape" : " shapes");
+  if (f.hasViewBox)
+    std::cout << ", view box " << Number(f.viewBox.left) << " " << Number(f.viewBox.bottom) << " "
+              << Number(f.viewBox.Width()) << " " << Number(f.viewBox.Height());
+  std::cout << "; y up: y = " << (f.mirror == 0 ? std::string("-y_svg") : Number(f.mirror) + " - y_svg") << "\n";
+
+  int index = 0;
+  for (const auto& shape : doc.shapes) {
+    ++index;
+    const auto& c = shape.curve;
+    const int n = int(c.GetPointCount());
+    V const* pts = c.GetPoints();
+    NODETYPE const* nodes = c.GetNodeTypes();
+    std::cout << "\nshape " << index << ": <" << shape.element;
+    if (!shape.id.empty()) std::cout << " id=\"" << shape.id << "\"";
+    std::cout << "> line " << shape.line << ", fill-rule "
+              << (shape.fillRule == OstraCrv::svgdoc::FillRule::evenodd ? "evenodd" : "nonzero") << ", "
+              << CRV_NumSubpaths(nodes, n) << (CRV_NumSubpaths(nodes, n) == 1 ? " subpath, " : " subpaths, ")
+              << Describe(Count(pts, nodes, n)) << "\n";
+    if (!shape.problem.empty()) std::cout << "  incomplete: " << shape.problem << "\n";
+    int sub = 0;
+    for (int first = 0; first < n;) {
+      const int count = CRV_CountNodesInSubpath(nodes + first, first, n);
+      ++sub;
+      const bool closed = IsClosedNode(nodes[first]);
+      std::cout << "  subpath " << sub << ": " << (count == 1 ? "lone move" : closed ? "closed" : "open") << ", "
+                << Describe(Count(pts + first, nodes + first, count)) << "\n";
+      first += count;
+    }
+  }
+  (void)digits;
+  return kOk;
+}
+
+}  // namespace crv

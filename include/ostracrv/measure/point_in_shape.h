@@ -2,11 +2,12 @@
 //
 // The curves are not flattened: a straight probe through the point is handed
 // to the intersection engine with the shape's closed subpaths as targets, and
-// the meetings on either side of the point are counted (count_edges.h). Open
-// subpaths are no part of a shape and are ignored. The engine runs with the
-// point-in-shape settings (PointInShapeIntersectionSettings: end and touch
-// tolerance 0.5), so a point closer than about that to the outline may come
-// out on the edge.
+// the places where the outline passes through the probe are counted on
+// either side of the point, with their directions. Open subpaths are no part
+// of a shape and are ignored. The engine runs with the point-in-shape
+// settings (PointInShapeIntersectionSettings: end and touch tolerance 0.5):
+// the outline within that distance of the probe counts as on it, which never
+// changes the answer for a point farther than that from the outline.
 #pragma once
 
 #include "ostracrv/core/common_types.h"

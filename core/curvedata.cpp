@@ -128,7 +128,10 @@ void CurveData<T>::Replace(unsigned long pos, unsigned long count, T const* p, N
     return;
   }
   if (m - count > points.max_size() - size) throw std::length_error("CurveData::Replace");
-  Reserve(size + (m - count));
+  // Grow geometrically, as PushBack does, so that a run of small inserts
+  // (appending Beziers one by one) stays linear overall.
+  const unsigned long need = size + (m - count);
+  if (need > points.capacity()) Reserve(std::max<unsigned long>(need, 2 * points.capacity()));
   if (count > 0) {
     std::memcpy(points.data() + pos, p, count * sizeof(T));
     std::memcpy(nodes.data() + pos, nd, count);

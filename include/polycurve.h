@@ -2,13 +2,19 @@
 // whole public interface.
 #pragma once
 
+#include "ostracrv/core/close_subpaths.h"
 #include "ostracrv/core/common_types.h"
 #include "ostracrv/core/curvedata.h"
 #include "ostracrv/core/curveposition.h"
 #include "ostracrv/core/curvesegment.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
+#include "ostracrv/core/path_reverse.h"
 #include "ostracrv/core/polycurve.h"
+#include "ostracrv/core/segment_cut.h"
+#include "ostracrv/core/subcurve_range.h"
+#include "ostracrv/core/subpath_list.h"
+#include "ostracrv/core/subpath_spin.h"
 #include "ostracrv/io/svg_path.h"
 #include "ostracrv/math/angles.h"
 #include "ostracrv/math/bezier_area.h"
@@ -47,3 +53,8 @@
 #include "ostracrv/measure/pointoncurve.h"
 #include "ostracrv/measure/subpath_hierarchy.h"
 #include "ostracrv/measure/tangents.h"
+#include "ostracrv/shapes/circular_arc.h"
+#include "ostracrv/shapes/corner_arc.h"
+#include "ostracrv/shapes/curve_append.h"
+#include "ostracrv/shapes/ellipse.h"
+#include "ostracrv/shapes/rectangle.h"

@@ -60,6 +60,9 @@ TEST(SvgDocument, ClockwiseOnScreenIsClockwiseWithYUp) {
   ASSERT_EQ(d.shapes.size(), 2u);
   EXPECT_NEAR(Shoelace(d.shapes[0].curve), -2 * 200, 1e-9);
   EXPECT_NEAR(Shoelace(d.shapes[1].curve), 2 * 100, 1e-9);
+  // The library counts clockwise (with y up) positive.
+  const auto& rect = d.shapes[0].curve;
+  EXPECT_NEAR(OstraCrv::GetArea(rect.GetPoints(), rect.GetNodeTypes(), int(rect.GetPointCount())), 200, 1e-9);
 }
 
 TEST(SvgDocument, TransformListsMapPointsAsSvgDoes) {

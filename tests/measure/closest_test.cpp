@@ -81,20 +81,10 @@ TYPED_TEST(Closest, NearestPointMatchesBruteForce) {
       // All local minima: sorted, led by the nearest point, each a record
       // of a real place on the path.
       std::vector<ClosestPoint<T, CurvePosition>> all;
-      auto dump = [&] {
-        std::string s;
-        for (size_t i = 0; i < p.points.size(); ++i)
-          s += std::to_string(p.shape.nodes[i]) + " " + std::to_string(p.points[i].x) + " " +
-               std::to_string(p.points[i].y) + "\n";
-        for (auto& r : all)
-          s += "rec " + std::to_string(r.position.endNode) + " t " + std::to_string(r.position.t) + " d " +
-               std::to_string(std::sqrt(r.distanceSquared)) + "\n";
-        return s + "target " + std::to_string(q.x) + " " + std::to_string(q.y);
-      };
       ASSERT_TRUE(OstraCrv::FindClosestPoints(p.points.data(), p.shape.nodes.data(), p.shape.n(), target, all))
-          << dump();
+          << round;
       EXPECT_TRUE(std::is_sorted(all.begin(), all.end()));
-      EXPECT_NEAR(std::sqrt(all.front().distanceSquared), std::sqrt(ref), 1e-6 * (1 + std::sqrt(ref))) << dump();
+      EXPECT_NEAR(std::sqrt(all.front().distanceSquared), std::sqrt(ref), 1e-6 * (1 + std::sqrt(ref))) << round;
       for (const auto& r : all) CheckRecord(p, r, q);
 
       // Every discrete local minimum of the sampled distance along a subpath

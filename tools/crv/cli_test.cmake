@@ -28,6 +28,10 @@ expect(0 "usage: crv info" info --help)
 expect(0 "usage: crv render" render -h)
 expect(0 "shape 1: <path id=\"ring\">.*subpath 2: closed" info ${SAMPLES}/ring.svg)
 expect(0 "fill-rule evenodd" info ${SAMPLES}/groups.svg)
+# Areas with y up: the outline drawn clockwise on screen counts positive, the
+# hole drawn the other way negative (a circle of radius 50 and one of 25).
+expect(0 "subpath 1: closed, 4 nodes, 13 points, 4 segments, valid, area 785[0-9.]*, length 314.1" info ${SAMPLES}/ring.svg)
+expect(0 "subpath 2: closed, [^\n]*area -196[0-9.]*, length 157.0[^\n]*bounds x 35 .. 85, y 35 .. 85" info ${SAMPLES}/ring.svg)
 expect(0 "" info --precision 4 ${SAMPLES}/letter.svg)
 expect(0 "" render ${SAMPLES}/overlap.svg -o ${WORK}/overlap.svg)
 expect(0 "" render ${SAMPLES}/letter.svg --output=${WORK}/letter.svg)

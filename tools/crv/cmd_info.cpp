@@ -38,19 +38,24 @@ namespace {
 
 using MavikMath::V;
 
-struct Counts {
+// Counts and measurements of a stretch of a path (one subpath or all).
+struct Facts {
   int userNodes = 0, points = 0, segments = 0;
   bool valid = false;
+  double area = 0, length = 0;
+  MavikMath::Bounds bounds;
 };
 
-Counts Count(V const* pts, NODETYPE const* nodes, int n) {
-  (void)pts;
-  Counts c;
-  c.userNodes = CRV_GetNumberOfUserNodes(nodes, unsigned(n), false);
-  c.points = n;
-  c.segments = OstraCrv::GetSegmentCount(nodes, n);
-  c.valid = OstraCrv::IsValidCurve(nodes, (unsigned long)n);
-  return c;
+Facts Measure(V const* pts, NODETYPE const* nodes, int n) {
+  Facts f;
+  f.userNodes = CRV_GetNumberOfUserNodes(nodes, unsigned(n), false);
+  f.points = n;
+  f.segments = OstraCrv::GetSegmentCount(nodes, n);
+  f.valid = OstraCrv::IsValidCurve(nodes, (unsigned long)n);
+  f.area = OstraCrv::GetArea(pts, nodes, n);
+  f.length = OstraCrv::GetLength(pts, nodes, n);
+  OstraCrv::GetTightBBox(pts, nodes, n, f.bounds);
+  return f;
 }
 
 // Depth of every subpath in the containment tree, by its first node: 1 for
@@ -69,11 +74,17 @@ std::string DepthName(int depth) {
   return depth % 2 == 0 ? "hole" : "island";
 }
 
-std::string Describe(const Counts& c) {
+std::string Describe(const Facts& f, int digits) {
   std::ostringstream s;
-  s << c.userNodes << (c.userNodes == 1 ? " node, " : " nodes, ") << c.points
-    << (c.points == 1 ? " point, " : " points, ") << c.segments << (c.segments == 1 ? " segment" : " segments")
-    << ", " << (c.valid ? "valid" : "INVALID");
+  s << f.userNodes << (f.userNodes == 1 ? " node, " : " nodes, ") << f.points
+    << (f.points == 1 ? " point, " : " points, ") << f.segments << (f.segments == 1 ? " segment" : " segments")
+    << ", " << (f.valid ? "valid" : "INVALID") << ", area " << Number(f.area, digits) << ", length "
+    << Number(f.length, digits) << ", bounds ";
+  if (f.bounds.IsEmpty())
+    s << "empty";
+  else
+    s << "x " << Number(f.bounds.left, digits) << " .. " << Number(f.bounds.right, digits) << ", y "
+      << Number(f.bounds.bottom, digits) << " .. " << Number(f.bounds.top, digits);
   return s.str();
 }
 
@@ -120,8 +131,8 @@ int RunInfo(const std::vector<std::string>& argv) {
     if (!shape.id.empty()) std::cout << " id=\"" << shape.id << "\"";
     std::cout << "> line " << shape.line << ", fill-rule "
               << (shape.fillRule == OstraCrv::svgdoc::FillRule::evenodd ? "evenodd" : "nonzero") << ", "
-              << CRV_NumSubpaths(nodes, n) << (CRV_NumSubpaths(nodes, n) == 1 ? " subpath, " : " subpaths, ")
-              << Describe(Count(pts, nodes, n)) << "\n";
+              << CRV_NumSubpaths(nodes, n) << (CRV_NumSubpaths(nodes, n) == 1 ? " subpath" : " subpaths") << "\n"
+              << "  whole: " << Describe(Measure(pts, nodes, n), digits) << "\n";
     if (!shape.problem.empty()) std::cout << "  incomplete: " << shape.problem << "\n";
     std::map<int, int> depths;
     if (n > 0) {
@@ -134,14 +145,13 @@ int RunInfo(const std::vector<std::string>& argv) {
       ++sub;
       const bool closed = IsClosedNode(nodes[first]);
       std::cout << "  subpath " << sub << ": " << (count == 1 ? "lone move" : closed ? "closed" : "open") << ", "
-                << Describe(Count(pts + first, nodes + first, count));
+                << Describe(Measure(pts + first, nodes + first, count), digits);
       if (closed && count > 1 && depths.count(first))
         std::cout << ", depth " << depths[first] << " (" << DepthName(depths[first]) << ")";
       std::cout << "\n";
       first += count;
     }
   }
-  (void)digits;
   return kOk;
 }
 

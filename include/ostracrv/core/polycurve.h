@@ -36,6 +36,7 @@
 #include "ostracrv/core/curveposition.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
+#include "ostracrv/core/subcurve_range.h"
 #include "ostracrv/math/matrix.h"
 #include "ostracrv/math/rect.h"
 #include "ostracrv/math/side.h"
@@ -248,6 +249,217 @@ class PolycurveT {
   // Appends m entries, copying shared storage once into arrays of the final
   // length. The arguments have been checked.
   void Append(T const* points, NODETYPE const* nodes, unsigned long m);
+
+ public:
+  // ---- Building: appends, joins, closing, cutting, makers ----
+  //
+  // Each forks the storage first. The plain appends do not validate: a curve
+  // that does not start with MoveTo is not a valid path. Tolerances are plain
+  // distances in the units of T unless named squared; a join or a closing
+  // within tolerance compares the squared distance with the tolerance squared,
+  // "at most", so a tolerance of 0.0 joins coincident points.
+
+  // The coordinate type of T: int32 for POINT, double for V.
+  using coordinate_type = decltype(T::x);
+
+  // Push p as a move (a new subpath), a line end, or a Bezier (c1, c2 as arcs,
+  // p as a curve node). Return true.
+  bool MoveTo(T const& p);
+  bool MoveTo(coordinate_type x, coordinate_type y);
+  bool LineTo(T const& p);
+  bool LineTo(coordinate_type x, coordinate_type y);
+  // As LineTo, but on a curve that ends in a line whose previous point, end
+  // and p lie within sqrt(10) units of one line, the end is moved to p instead
+  // of adding a node. False, with nothing added, on an empty curve.
+  bool LineTo(T const& p, bool mergeCollinear);
+  bool LineTo(coordinate_type x, coordinate_type y, bool mergeCollinear);
+  bool CubicTo(T const& c1, T const& c2, T const& p);
+  // Appends the circular arc from the last point to p that leaves in the
+  // direction tangent (a line where no arc fits). False, with nothing changed,
+  // on an empty curve or when no arc or line can be built (non-finite input).
+  bool CircularArcTo(T const& p, MavikMath::vector2dT<double, false> const& tangent);
+  // The same with the direction in which the curve arrives at its end; after
+  // a lone first node, the chord turned a quarter counter-clockwise, which
+  // gives a clockwise half circle bulging to the left of the chord.
+  bool CircularArcTo(T const& p);
+
+  // Appends p as a start node unless the curve ends exactly at p; then the
+  // last node only takes over the enabled bit and the continuity of node.
+  // The pushed byte keeps the low six bits of node, so it is a move.
+  void PushBackWithJoinCheck(T const& p, NODETYPE const& node);
+  // PushBackWithJoinCheck(p[0], node), then p[1] as a line end. False for a
+  // null p.
+  bool AppendLineWithJoin(T const* p, NODETYPE const& node);
+  // PushBackWithJoinCheck(p[0], node), then p[1], p[2] as arcs and p[3] as a
+  // curve end. False for a null p.
+  bool AppendBezierWithJoin(T const* p, NODETYPE const& node);
+  // Appends other. If this curve's open end lies within tolerance of other's
+  // start, other continues it: the seam node loses its continuity, keeps its
+  // point, and other's first node is dropped (a closed first subpath of
+  // other opens there). Otherwise (also when this curve ends closed) other is
+  // appended whole. closeAfter then tries CloseLastSubpath(tolerance, false).
+  // An empty other changes nothing.
+  void AppendWithJoin(PolycurveT const& other, bool closeAfter, double tolerance);
+
+  // Closes the last subpath when it has at least three nodes and its ends lie
+  // within tolerance: both ends move to their midpoint (the integer form
+  // truncates the halved sum), the first node gets the closed and user bits,
+  // the last the closed bit without the user bit. With addLine, ends further
+  // apart first get a line back to the first point, and the subpath closes on
+  // it; if even that cannot close (a subpath of one node), the line is taken
+  // away again. Returns whether it closed; false on fewer than two nodes.
+  bool CloseLastSubpath(double tolerance, bool addLine);
+  bool CloseLastSubpathWithOptionalLine();
+  // Closes every open subpath: ends that coincide exactly are closed in
+  // place, others get a closing line back to the first point. With skipShort,
+  // subpaths of fewer than three nodes stay open. Returns whether any subpath
+  // was open (also if only short ones were); false on an empty curve, with
+  // nothing touched. O(n).
+  bool CloseOpenSubpaths(bool skipShort);
+  // The closed bit of the final node, and its opposite; both false on an
+  // empty curve.
+  bool IsLastSubpathClosed() const noexcept;
+  bool IsLastSubpathOpen() const noexcept;
+
+  // Removes the last segment (3 nodes for a Bezier, 1 otherwise; a final move
+  // goes like a line). If it closed a subpath, the subpath's first node
+  // becomes a plain open move. False, with nothing changed, on fewer than two
+  // nodes or too few nodes for the segment.
+  bool PopLastSegment();
+  // Removes the segment that ends at endNode. A middle segment of an open
+  // subpath splits it in two; a first or last segment shortens it; a closed
+  // subpath of several segments opens at that segment (turned so that it
+  // runs from the segment's end round to its start); the only segment of a
+  // subpath takes the whole subpath with it. False for an endNode out of
+  // range, a move or an arc; otherwise whether the count changed. O(n).
+  bool DeleteSegment(unsigned long endNode);
+  // Replace count nodes at pos by n new ones (pos clamped to the size, count
+  // to the nodes behind pos). False, with nothing changed, for null arrays
+  // with n > 0 or an implausible n.
+  bool ReplacePoints(unsigned long pos, unsigned long count, T const* points, NODETYPE const* nodes,
+                     unsigned long n);
+  bool ReplacePoints(unsigned long pos, unsigned long count, PolycurveT const& a);
+  // As above, then b's nodes from its second on directly behind a's: b's
+  // move is dropped so that a and b form one chain.
+  bool ReplacePoints(unsigned long pos, unsigned long count, PolycurveT const& a, PolycurveT const& b);
+  bool DeletePoints(unsigned long pos, unsigned long count);
+  bool InsertPoints(unsigned long pos, T const* points, NODETYPE const* nodes, unsigned long n);
+
+  // Appends o (PushBack), or each curve of a vector in order.
+  PolycurveT& operator+=(PolycurveT const& o);
+  PolycurveT& operator+=(std::vector<PolycurveT> const& curves);
+  // Moves every point, control points included, by offset; the integer form
+  // rounds the offset once, half away from zero.
+  PolycurveT& operator+=(MavikMath::vector2dT<double, false> const& offset);
+  // Transforms every point; the integer form rounds half away from zero.
+  PolycurveT& operator*=(MavikMath::MATRIX const& m);
+  // Transforms by the inverse of m. A singular m is applied uninverted.
+  PolycurveT& operator/=(MavikMath::MATRIX const& m);
+
+  // Makers: the Create*Subpath methods append a shape as a new subpath, the
+  // static Create* return a curve of that shape alone. A shape builder that
+  // writes nothing (non-finite arguments) leaves the curve as it was and the
+  // method returns false.
+  //
+  // The line a (move) to b (line end).
+  static PolycurveT CreateLine(T const& a, T const& b);
+  bool CreateLineSubpath(T const& a, T const& b);
+  // The rectangle's corners (left, top), (right, top), (right, bottom),
+  // (left, bottom), closed: clockwise with y up, positive area in both point
+  // kinds.
+  static PolycurveT CreateRectangle(Framework::common_types::RECT const& rect);
+  bool CreateRectangleSubpath(Framework::common_types::RECT const& rect);
+  // The closed 13-node circle starting at angle 0.
+  static PolycurveT CreateCircle(T const& centre, double radius);
+  bool CreateCircleSubpath(T const& centre, double radius);
+  // The closed ellipse with radii.x and radii.y, starting at angle 0.
+  static PolycurveT CreateEllipse(T const& centre, T const& radii);
+  bool CreateEllipseSubpath(T const& centre, T const& radii);
+  // The circular arc from a to b through c (a line where no arc fits).
+  bool Create3PointArcSubpath(T const& a, T const& b, T const& c);
+
+ public:
+  // ---- Subpaths and subcurves ----
+  //
+  // A position on the curve is a segment's start node and a parameter t in
+  // 0..1 on that segment. Parameters within 2.2e-16 of 0 or 1 count as the
+  // segment's ends. Results that are curves are new, independent curves; the
+  // Get* family answers an empty curve (or vector) rather than failing.
+
+  // A copy of count nodes from first (first clamped to the size, count to the
+  // nodes behind it); a first node that is not a move is made one.
+  PolycurveT GetSubcurve(unsigned long first, unsigned long count) const;
+  // The piece from (a, t0) to (b, t1). It may cross subpath borders going
+  // forward; with (b, t1) before (a, t0) it wraps round the closing point of
+  // a's subpath, which must be closed. The piece is an open chain: its ends
+  // are user nodes, and a cut end is not selected. With reversed, the piece
+  // of GetSubcurve(b, t1, a, t0, false) is returned turned round, running
+  // from (a, t0) to (b, t1) against the curve's direction. Empty for
+  // positions that are not segment starts, parameters outside 0..1 (or NaN),
+  // an empty stretch, or a wrap on an open subpath. O(length of the piece).
+  PolycurveT GetSubcurve(unsigned long a, double t0, unsigned long b, double t1, bool reversed) const;
+  // The curve from its start up to (node, t), and from (node, t) to its end.
+  // Empty on an empty curve and for a piece of no length at the ends.
+  PolycurveT GetLeftSubcurve(unsigned long node, double t) const;
+  PolycurveT GetRightSubcurve(unsigned long node, double t) const;
+  // A copy of the subpath that holds node; empty for a node out of range or a
+  // subpath of a single node.
+  PolycurveT GetSubpath(unsigned long node) const;
+  // The first node and one past the last node of node's subpath; false (and
+  // nothing written) for a node out of range or a single-node subpath.
+  bool GetSubpathRange(unsigned long node, unsigned long& begin, unsigned long& end) const;
+  MavikUtils::optional<MavikUtils::RangeView<MavikUtils::IndexT<unsigned long>>> GetSubpathRange(
+      unsigned long node) const;
+  // The first and last node of node's subpath; -1 out of range.
+  int FirstNodeOfSubpath(unsigned long node) const;
+  int LastNodeOfSubpath(unsigned long node) const;
+  // (first, count) of every subpath in array order, lone moves included.
+  std::vector<SubcurveRange> GetSubpathIndices() const;
+  // The subpaths with at least one node (arcs included) whose enabled bit
+  // equals wanted; the form without argument asks for enabled ones.
+  std::vector<SubcurveRange> GetEnabledSubpathIndices(bool wanted) const;
+  std::vector<SubcurveRange> GetEnabledSubpathIndices() const;
+  // The number of moves.
+  int GetNumberOfSubpaths() const;
+  // True for the last node, a move and a node followed by a move; false out
+  // of range.
+  bool IsSubpathStartOrEnd(unsigned long node) const;
+  // Records over this curve's arrays (no copy; valid while the storage is
+  // unchanged): all subpaths with limit true, or those holding an enabled
+  // node with limit false.
+  std::vector<ConstDrawCurveT<T>> GetSubpathCurves() const;
+  std::vector<ConstDrawCurveT<T>> GetEnabledSubpathCurves() const;
+  // Each subpath as an owning copy.
+  std::vector<PolycurveT> GetSubpaths() const;
+  // Each subpath as a handle over a view into this curve's arrays: no point
+  // is copied, and the handles are valid as long as this curve's storage
+  // stays as it is (writes through them fork away).
+  std::vector<PolycurveT> GetSubpathRefs() const;
+  // The glyphs of a text curve: a subpath whose first node has the letter bit
+  // starts a new curve, and the subpaths behind it without the bit (its inner
+  // contours) join that curve. A letter subpath of a single node only starts
+  // the group. Subpaths before the first letter are left out; no letter bit
+  // gives an empty vector.
+  std::vector<PolycurveT> GetLetterCurves() const;
+  // Turns the closed subpath of range (or of anyNode) so that node becomes
+  // its first node; shape, count and closure stay. False, with nothing
+  // changed, for a range outside the curve or a subpath that is not closed.
+  bool SpinSubpath(SubcurveRange range, unsigned long node);
+  bool SpinSubpath(unsigned long anyNode, unsigned long node);
+  // Removes the subpath that holds node; false out of range or for a
+  // single-node subpath.
+  bool DeleteSubpath(unsigned long node);
+  // Turns a curve of one closed subpath so that it starts at node. No check
+  // is made that the curve is one closed subpath. False, with nothing
+  // changed, unless 1 <= node <= count - 2 (node 0 and the closing node are
+  // the start already).
+  bool SetPathStartAt(unsigned long node);
+  // Reverses the direction of every subpath (and their order). O(n).
+  void Reverse();
+  // Moves all open subpaths out of this curve into the returned curve, in
+  // order. With dropDangling, open stretches of a single node are removed
+  // from this curve and not returned. O(n).
+  PolycurveT ExtractOpenSubpaths(bool dropDangling);
 
  public:
   // ---- Measurement ----

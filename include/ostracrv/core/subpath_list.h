@@ -5,18 +5,9 @@
 
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/core/polycurve.h"
+#include "ostracrv/core/subcurve_range.h"
 
 namespace OstraCrv {
-
-// A stretch of a path: its first node and its node count.
-struct SubcurveRange {
-  unsigned long first = 0;
-  unsigned long count = 0;
-
-  friend constexpr bool operator==(const SubcurveRange& a, const SubcurveRange& b) noexcept {
-    return a.first == b.first && a.count == b.count;
-  }
-};
 
 // Clears out, then appends one record per subpath in array order, pointing
 // into the arrays (nothing is copied): each stretch runs from a first node to

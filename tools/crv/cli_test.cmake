@@ -45,6 +45,20 @@ expect(0 "point -5 -7.5 \\(library -5 127.5\\)" inside ${SAMPLES}/ring.svg -5 -7
 # Geometry read up to a path data error still counts as read.
 expect(0 "baddata.svg: line 1: <path> d: expected a number at offset 11" info ${WORK}/baddata.svg)
 
+# Meetings: the star crosses the disc twice; two files together.
+expect(0 "usage: crv intersect-points" help intersect-points)
+expect(0 "^2 meetings among 2 subpaths.*meeting 1: [^\n]*crossing.*meeting 2: [^\n]*crossing" intersect-points ${SAMPLES}/overlap.svg)
+expect(0 "meetings among 6 subpaths" intersect-points ${SAMPLES}/ring.svg ${SAMPLES}/overlap.svg)
+file(WRITE ${WORK}/share.svg "<svg viewBox='0 0 120 80'><rect x='10' y='10' width='40' height='40'/><rect x='50' y='20' width='40' height='40'/><path d='M30 50 L30 70'/></svg>")
+expect(0 "overlap start.*overlap end.*touch" intersect-points ${WORK}/share.svg -o ${WORK}/share_out.svg)
+file(READ ${WORK}/share_out.svg drawn)
+foreach(part "id=\"meetings\"" "id=\"overlaps\"" "overlap end</text>")
+  string(FIND "${drawn}" "${part}" at)
+  if(at EQUAL -1)
+    message(SEND_ERROR "intersect-points drawing lacks ${part}")
+  endif()
+endforeach()
+
 # Bad usage.
 expect(2 "usage: crv")
 expect(2 "unknown command 'frobnicate'" frobnicate)
@@ -57,6 +71,10 @@ expect(2 "needs an output file" render ${SAMPLES}/ring.svg)
 expect(2 "expects FILE.svg and the two coordinates" inside ${SAMPLES}/ring.svg 1)
 expect(2 "unknown option --bogus" inside ${SAMPLES}/ring.svg 1 2 --bogus)
 expect(2 "option --output needs a value" render ${SAMPLES}/ring.svg -o)
+expect(2 "expects one or two SVG files" intersect-points)
+expect(2 "expects one or two SVG files" intersect-points a.svg b.svg c.svg)
+expect(2 "--tolerance takes a positive number" intersect-points ${SAMPLES}/ring.svg --tolerance -1)
+expect(1 "crv: ${WORK}/missing.svg: cannot open file" intersect-points ${SAMPLES}/ring.svg ${WORK}/missing.svg)
 
 # Unreadable input: one line naming the file and the problem.
 expect(1 "crv: ${WORK}/missing.svg: cannot open file" info ${WORK}/missing.svg)

@@ -35,8 +35,29 @@ expect(0 "subpath 2: closed, [^\n]*area -196[0-9.]*, length 157.0[^\n]*bounds x 
 expect(0 "" info --precision 4 ${SAMPLES}/letter.svg)
 expect(0 "" render ${SAMPLES}/overlap.svg -o ${WORK}/overlap.svg)
 expect(0 "" render ${SAMPLES}/letter.svg --output=${WORK}/letter.svg)
+expect(0 "subpath 2: closed[^\n]*depth 2 \\(hole\\)" info ${SAMPLES}/ring.svg)
+expect(0 "subpath 3: closed[^\n]*depth 3 \\(island\\)\n  subpath 4: closed[^\n]*depth 4 \\(hole\\)" info ${SAMPLES}/nested.svg)
+expect(0 "usage: crv inside" help inside)
+expect(0 "\"ring\"> fill-rule nonzero: nonzero inside, evenodd inside" inside ${SAMPLES}/ring.svg 20 60)
+expect(0 "\"frame\"> fill-rule evenodd: nonzero inside, evenodd outside; filled: outside" inside ${SAMPLES}/ring.svg 175 60)
+expect(0 "\"ring\"> fill-rule nonzero: on the outline" inside ${SAMPLES}/ring.svg 60 10)
+expect(0 "point -5 -7.5 \\(library -5 127.5\\)" inside ${SAMPLES}/ring.svg -5 -7.5)
 # Geometry read up to a path data error still counts as read.
 expect(0 "baddata.svg: line 1: <path> d: expected a number at offset 11" info ${WORK}/baddata.svg)
+
+# Meetings: the star crosses the disc twice; two files together.
+expect(0 "usage: crv intersect-points" help intersect-points)
+expect(0 "^2 meetings among 2 subpaths.*meeting 1: [^\n]*crossing.*meeting 2: [^\n]*crossing" intersect-points ${SAMPLES}/overlap.svg)
+expect(0 "meetings among 6 subpaths" intersect-points ${SAMPLES}/ring.svg ${SAMPLES}/overlap.svg)
+file(WRITE ${WORK}/share.svg "<svg viewBox='0 0 120 80'><rect x='10' y='10' width='40' height='40'/><rect x='50' y='20' width='40' height='40'/><path d='M30 50 L30 70'/></svg>")
+expect(0 "overlap start.*overlap end.*touch" intersect-points ${WORK}/share.svg -o ${WORK}/share_out.svg)
+file(READ ${WORK}/share_out.svg drawn)
+foreach(part "id=\"meetings\"" "id=\"overlaps\"" "overlap end</text>")
+  string(FIND "${drawn}" "${part}" at)
+  if(at EQUAL -1)
+    message(SEND_ERROR "intersect-points drawing lacks ${part}")
+  endif()
+endforeach()
 
 # Bad usage.
 expect(2 "usage: crv")
@@ -47,12 +68,19 @@ expect(2 "expects exactly one FILE" info a.svg b.svg)
 expect(2 "unknown option --bogus" info --bogus ${SAMPLES}/ring.svg)
 expect(2 "--precision" info --precision x ${SAMPLES}/ring.svg)
 expect(2 "needs an output file" render ${SAMPLES}/ring.svg)
+expect(2 "expects FILE.svg and the two coordinates" inside ${SAMPLES}/ring.svg 1)
+expect(2 "unknown option --bogus" inside ${SAMPLES}/ring.svg 1 2 --bogus)
 expect(2 "option --output needs a value" render ${SAMPLES}/ring.svg -o)
+expect(2 "expects one or two SVG files" intersect-points)
+expect(2 "expects one or two SVG files" intersect-points a.svg b.svg c.svg)
+expect(2 "--tolerance takes a positive number" intersect-points ${SAMPLES}/ring.svg --tolerance -1)
+expect(1 "crv: ${WORK}/missing.svg: cannot open file" intersect-points ${SAMPLES}/ring.svg ${WORK}/missing.svg)
 
 # Unreadable input: one line naming the file and the problem.
 expect(1 "crv: ${WORK}/missing.svg: cannot open file" info ${WORK}/missing.svg)
 expect(1 "crv: ${WORK}/broken.svg: not well-formed XML" info ${WORK}/broken.svg)
 expect(1 "crv: ${WORK}/notsvg.svg: root element is <html>" render ${WORK}/notsvg.svg -o ${WORK}/x.svg)
+expect(1 "crv: ${WORK}/missing.svg: cannot open file" inside ${WORK}/missing.svg 1 2)
 expect(1 "cannot write file" render ${SAMPLES}/ring.svg -o ${WORK}/no/such/dir/out.svg)
 
 # The rendered file is an SVG document that crv itself reads back: the

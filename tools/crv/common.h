@@ -46,7 +46,11 @@ struct Args {
 // The subcommands: each takes the arguments after its name.
 int RunInfo(const std::vector<std::string>& args);
 int RunRender(const std::vector<std::string>& args);
+int RunInside(const std::vector<std::string>& args);
+int RunIntersectPoints(const std::vector<std::string>& args);
 extern const char* const kInfoHelp;
 extern const char* const kRenderHelp;
+extern const char* const kInsideHelp;
+extern const char* const kIntersectPointsHelp;
 
 }  // namespace crv

@@ -21,6 +21,11 @@ const char* const kHelp =
     "                                bounds of every path and subpath\n"
     "  render FILE.svg -o OUT.svg    draw the paths with nodes, control points and handles\n"
     "                                marked (--png also writes a PNG)\n"
+    "  intersect-points A.svg [B.svg] [-o OUT.svg]\n"
+    "                                crossings, touches and shared stretches of the\n"
+    "                                paths, listed (and drawn with -o)\n"
+    "  inside FILE.svg X Y           whether a point lies inside each path, by the non-zero\n"
+    "                                and the even-odd rule\n"
     "  help [COMMAND]                this text, or the help of one command\n"
     "\n"
     "'crv COMMAND --help' shows the help of a command.\n"
@@ -45,6 +50,8 @@ int main(int argc, char** argv) {
   args.erase(args.begin());
   if (command == "info") return crv::RunInfo(args);
   if (command == "render") return crv::RunRender(args);
+  if (command == "inside") return crv::RunInside(args);
+  if (command == "intersect-points") return crv::RunIntersectPoints(args);
   if (command == "help" || command == "--help" || command == "-h") {
     if (args.empty()) {
       std::cout << kHelp;
@@ -56,6 +63,14 @@ int main(int argc, char** argv) {
     }
     if (args[0] == "render") {
       std::cout << crv::kRenderHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "inside") {
+      std::cout << crv::kInsideHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "intersect-points") {
+      std::cout << crv::kIntersectPointsHelp;
       return crv::kOk;
     }
     std::cerr << "crv help: unknown command '" << args[0] << "'\n";

@@ -39,6 +39,7 @@
 #include "ostracrv/core/subcurve_range.h"
 #include "ostracrv/math/matrix.h"
 #include "ostracrv/math/rect.h"
+#include "ostracrv/math/side.h"
 #include "ostracrv/math/vector2d.h"
 
 namespace OstraCrv {
@@ -617,6 +618,23 @@ class PolycurveT {
   // CRV_BreakAtLocation). Returns whether it broke; nothing changes on an
   // empty curve or a position that cannot be broken.
   bool BreakAt(unsigned long i, double t);
+
+ public:
+  // ---- Point in shape ----
+  // See point_in_shape.h, point_in_shape_interior.h and curve_side.h.
+
+  // Whether p lies inside the closed subpaths of the curve, by non-zero
+  // winding or by even-odd; a point on the outline answers resultOnEdge.
+  bool IsPointInShape(T const& p, bool resultOnEdge, bool nonZero) const;
+  // Some point strictly inside the curve's shape (GetPointInShape); false,
+  // out unchanged, if none is found.
+  bool FindPointInShape(T& out) const;
+  // The side of the nearest segment on which p lies, in its forward frame
+  // with y up; SideNone on the curve or for a curve without segments.
+  MavikMath::Side GetSide(T const& p) const;
+  // The side of this curve on which a point inside `other` lies; SideNone if
+  // no point inside other is found.
+  MavikMath::Side OnLeftOrRight(PolycurveT const& other) const;
 };
 
 // A handle over arrays that the caller owns and keeps alive as long as any

@@ -24,14 +24,8 @@ using OstraCrv::Polycurve;
 using OstraCrv::PolycurveD;
 using Bytes = std::vector<NODETYPE>;
 
-template <class C>
-Bytes NodesOf(const C& c) {
-  return {c.GetNodeTypes(), c.GetNodeTypes() + c.GetPointCount()};
-}
-template <class C>
-bool Valid(const C& c) {
-  return OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount());
-}
+using testgeo::NodesOf;
+using testgeo::Valid;
 template <class C>
 double Area(const C& c) {
   return testgeo::ClockwiseArea(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));

@@ -19,11 +19,8 @@ using OstraCrv::Polycurve;
 using OstraCrv::PolycurveD;
 using Bytes = std::vector<NODETYPE>;
 
-Bytes NodesOf(const PolycurveD& c) { return {c.GetNodeTypes(), c.GetNodeTypes() + c.GetPointCount()}; }
-template <class C>
-bool Valid(const C& c) {
-  return OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount());
-}
+using testgeo::NodesOf;
+using testgeo::Valid;
 std::multiset<std::vector<double>> Segments(const PolycurveD& c) {
   return testgeo::SegmentSet(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
 }

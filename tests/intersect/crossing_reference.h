@@ -11,7 +11,7 @@
 #include <optional>
 #include <vector>
 
-#include "ostracrv/math/vector2d.h"
+#include "core/path_geometry.h"
 
 namespace crossing_ref {
 
@@ -21,10 +21,7 @@ struct Seg {
   std::vector<V> p;  // 2 points for a line, 4 for a Bezier
   V At(double t) const {
     if (p.size() == 2) return V{p[0].x + (p[1].x - p[0].x) * t, p[0].y + (p[1].y - p[0].y) * t};
-    const double s = 1.0 - t;
-    const double b0 = s * s * s, b1 = 3 * s * s * t, b2 = 3 * s * t * t, b3 = t * t * t;
-    return V{b0 * p[0].x + b1 * p[1].x + b2 * p[2].x + b3 * p[3].x,
-             b0 * p[0].y + b1 * p[1].y + b2 * p[2].y + b3 * p[3].y};
+    return testgeo::Bezier(p.data(), t);
   }
   V Derivative(double t) const {
     if (p.size() == 2) return V{p[1].x - p[0].x, p[1].y - p[0].y};

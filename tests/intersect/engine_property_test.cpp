@@ -28,18 +28,13 @@ crossing_ref::Seg RandomSeg(std::mt19937& rng, Kind kind, bool integer) {
 }
 
 template <class T>
-T Convert(const V& v) {
-  return MavikMath::FromV<T>(v);
-}
-
-template <class T>
 Path<T> AsPath(const crossing_ref::Seg& s) {
   Path<T> p;
-  p.Move(Convert<T>(s.p[0]));
+  p.Move(MavikMath::FromV<T>(s.p[0]));
   if (s.p.size() == 2)
-    p.Line(Convert<T>(s.p[1]));
+    p.Line(MavikMath::FromV<T>(s.p[1]));
   else
-    p.Cubic(Convert<T>(s.p[1]), Convert<T>(s.p[2]), Convert<T>(s.p[3]));
+    p.Cubic(MavikMath::FromV<T>(s.p[1]), MavikMath::FromV<T>(s.p[2]), MavikMath::FromV<T>(s.p[3]));
   return p;
 }
 

@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "core/path_geometry.h"
 #include "ostracrv/intersect/segments.h"
 #include "ostracrv/io/svg_path.h"
 
@@ -68,14 +69,9 @@ struct Path {
 
 inline POINT P(int x, int y) { return POINT{x, y}; }
 
-// Independent evaluation: Bernstein form.
-inline V BezierAt(const V* p, double t) {
-  const double s = 1.0 - t;
-  const double b0 = s * s * s, b1 = 3 * s * s * t, b2 = 3 * s * t * t, b3 = t * t * t;
-  return V{b0 * p[0].x + b1 * p[1].x + b2 * p[2].x + b3 * p[3].x,
-           b0 * p[0].y + b1 * p[1].y + b2 * p[2].y + b3 * p[3].y};
-}
-inline double Dist2(const V& a, const V& b) { return (a.x - b.x) * (a.x - b.x) + (a.y - b.y) * (a.y - b.y); }
+// Independent evaluation: the Bernstein form of path_geometry.h.
+using testgeo::Bezier;
+using MavikMath::SquaredDistance;
 
 // The segment's points as doubles.
 template <class T>
@@ -91,7 +87,7 @@ template <class T>
 V SegmentAt(const SegmentsT<T>& s, int segment, double t) {
   const std::vector<V> p = SegmentPointsOf(s, segment);
   if (p.size() == 2) return V{p[0].x + (p[1].x - p[0].x) * t, p[0].y + (p[1].y - p[0].y) * t};
-  return BezierAt(p.data(), t);
+  return Bezier(p.data(), t);
 }
 
 // One record, with its links as list positions, for exact comparison.
@@ -163,7 +159,7 @@ void CheckInvariants(const SegmentsT<T>& s, double maxDistance) {
       if (k > 0) {
         EXPECT_LE(list[k - 1]->t, r->t);
       }
-      const double d = std::sqrt(Dist2(SegmentAt(s, static_cast<int>(si), r->t), r->point));
+      const double d = std::sqrt(SquaredDistance(SegmentAt(s, static_cast<int>(si), r->t), r->point));
       EXPECT_LE(d, maxDistance) << "segment " << si << " t " << r->t;
       if (r->overlapEnd) {
         ++withOverlapEnd;

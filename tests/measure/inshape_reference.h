@@ -42,7 +42,7 @@ std::vector<Ring> Flatten(const T* pts, const NODETYPE* nodes, int n) {
             m = std::max(m, std::hypot(double(b[d].x) - 2.0 * b[d + 1].x + b[d + 2].x,
                                        double(b[d].y) - 2.0 * b[d + 1].y + b[d + 2].y));
           const int steps = std::max(8, int(std::ceil(std::sqrt(6.0 * m))));
-          for (int s = 1; s <= steps; ++s) r.push_back(sampled::Bernstein(b, double(s) / steps));
+          for (int s = 1; s <= steps; ++s) r.push_back(testgeo::Bezier(b, double(s) / steps));
         }
       }
       rings.push_back(std::move(r));

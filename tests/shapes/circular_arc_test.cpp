@@ -20,13 +20,10 @@ using OstraCrv::Build3PointCircularArc;
 using OstraCrv::BuildCircularArc;
 
 constexpr double kPi = std::numbers::pi;
-constexpr double kQuarterError = 2.75e-4;
+using testgeo::kQuarterError;
 
 double MaxRadialError(const V* p, const NODETYPE* nd, unsigned long n, V c, double r) {
-  double worst = 0.0;
-  for (const auto& poly : testgeo::Flatten(p, nd, int(n), 64))
-    for (const V& q : poly) worst = std::max(worst, std::fabs(MavikMath::Distance(q, c) - r) / r);
-  return worst;
+  return testgeo::MaxUnitRadialError(p, nd, int(n), c, r, r);
 }
 
 TEST(CircularArc, PieceCounts) {

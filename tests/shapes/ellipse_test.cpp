@@ -18,21 +18,8 @@ using MavikMath::V;
 using OstraCrv::BuildEllipse;
 
 constexpr double kPi = std::numbers::pi;
-// Largest radial error of the standard quarter-circle Bezier, over the radius.
-constexpr double kQuarterError = 2.75e-4;
-
-// Largest radial error, on the unit circle the ellipse is mapped from, of
-// the samples of a path (a pie's centre skipped).
-template <class T>
-double MaxUnitRadialError(const T* p, const NODETYPE* nd, int n, V c, double rx, double ry) {
-  double worst = 0.0;
-  for (const auto& poly : testgeo::Flatten(p, nd, n, 64))
-    for (const V& q : poly) {
-      const double r = std::hypot((q.x - c.x) / rx, (q.y - c.y) / ry);
-      if (r > 1e-9) worst = std::max(worst, std::fabs(r - 1.0));
-    }
-  return worst;
-}
+using testgeo::kQuarterError;
+using testgeo::MaxUnitRadialError;
 
 TEST(Ellipse, CircleQuadrantsAreaAndLength) {
   V p[13];

@@ -68,3 +68,6 @@
 #include "ostracrv/shapes/curve_append.h"
 #include "ostracrv/shapes/ellipse.h"
 #include "ostracrv/shapes/rectangle.h"
+#include "ostracrv/weld/keep_rules.h"
+#include "ostracrv/weld/weldflags.h"
+#include "ostracrv/weld/weldstate.h"

@@ -52,5 +52,8 @@ extern const char* const kInfoHelp;
 extern const char* const kRenderHelp;
 extern const char* const kInsideHelp;
 extern const char* const kIntersectPointsHelp;
+// union, intersect, subtract, xor: command is the name.
+int RunWeld(const std::string& command, const std::vector<std::string>& args);
+extern const char* const kWeldHelp;
 
 }  // namespace crv

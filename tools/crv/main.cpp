@@ -26,6 +26,8 @@ const char* const kHelp =
     "                                paths, listed (and drawn with -o)\n"
     "  inside FILE.svg X Y           whether a point lies inside each path, by the non-zero\n"
     "                                and the even-odd rule\n"
+    "  union A.svg B.svg -o OUT.svg  the filled area of A or B; also intersect (A and B),\n"
+    "                                subtract (A and not B) and xor (exactly one)\n"
     "  help [COMMAND]                this text, or the help of one command\n"
     "\n"
     "'crv COMMAND --help' shows the help of a command.\n"
@@ -52,6 +54,8 @@ int main(int argc, char** argv) {
   if (command == "render") return crv::RunRender(args);
   if (command == "inside") return crv::RunInside(args);
   if (command == "intersect-points") return crv::RunIntersectPoints(args);
+  if (command == "union" || command == "intersect" || command == "subtract" || command == "xor")
+    return crv::RunWeld(command, args);
   if (command == "help" || command == "--help" || command == "-h") {
     if (args.empty()) {
       std::cout << kHelp;
@@ -71,6 +75,10 @@ int main(int argc, char** argv) {
     }
     if (args[0] == "intersect-points") {
       std::cout << crv::kIntersectPointsHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "union" || args[0] == "intersect" || args[0] == "subtract" || args[0] == "xor") {
+      std::cout << crv::kWeldHelp;
       return crv::kOk;
     }
     std::cerr << "crv help: unknown command '" << args[0] << "'\n";

@@ -41,6 +41,7 @@
 #include "ostracrv/math/rect.h"
 #include "ostracrv/math/side.h"
 #include "ostracrv/math/vector2d.h"
+#include "ostracrv/weld/weldflags.h"
 
 namespace OstraCrv {
 
@@ -635,6 +636,37 @@ class PolycurveT {
   // The side of this curve on which a point inside `other` lies; SideNone if
   // no point inside other is found.
   MavikMath::Side OnLeftOrRight(PolycurveT const& other) const;
+
+ public:
+  // ---- Welding ----
+  // Boolean operations on the filled areas of two curves (see weld/weldstate.h
+  // for the method). Only closed subpaths take part; each operand is filled
+  // by its own rule (true: non-zero winding, false: even-odd). The result is
+  // a new curve of closed loops whose fill under the even-odd rule is the
+  // answer; loops through crossings follow the operands' directions, an
+  // untouched subpath keeps its own. Computed in doubles, rounded half away
+  // from zero for integer curves. Never fails: empty operands, operands of
+  // open subpaths only and degenerate input give a valid, possibly empty,
+  // result; subpaths with non-finite coordinates take no part.
+
+  // The area covered by either operand.
+  static PolycurveT Union(PolycurveT const& first, PolycurveT const& second, bool firstNonZero,
+                          bool secondNonZero, WeldFlags flags = WeldFlags::None);
+  // The area covered by both.
+  static PolycurveT Intersect(PolycurveT const& first, PolycurveT const& second, bool firstNonZero,
+                              bool secondNonZero, WeldFlags flags = WeldFlags::None);
+  // The area of first not covered by second.
+  static PolycurveT Subtract(PolycurveT const& first, PolycurveT const& second, bool firstNonZero,
+                             bool secondNonZero, WeldFlags flags = WeldFlags::None);
+  // The area covered by exactly one of them.
+  static PolycurveT Xor(PolycurveT const& first, PolycurveT const& second, bool firstNonZero,
+                        bool secondNonZero, WeldFlags flags = WeldFlags::None);
+  // A factor by which a host may scale this curve before an operation so
+  // that its coordinates use the range up to 2^28: with m the largest of
+  // |smallest x|, |largest x|, the width, |smallest y| and the height, 2^28 / m,
+  // or 1 when m exceeds 2^28 or the width or the height is at most 2^-52.
+  // Not used by the library itself; 1 for an empty curve.
+  double GetWeldingUpScale() const;
 };
 
 // A handle over arrays that the caller owns and keeps alive as long as any

@@ -33,8 +33,9 @@ const Inputs& Data() {
   return in;
 }
 
-void BM_BezierBezierTransversal(benchmark::State& state) {
-  const Inputs& in = Data();
+// All intersections of the 256 pairs (first + stride i, second + stride i) in
+// turn, into lists reserved once.
+void IntersectPairs(benchmark::State& state, const V* first, const V* second, size_t stride) {
   std::vector<double> ta, tb;
   std::vector<V> pts;
   ta.reserve(16);
@@ -45,10 +46,14 @@ void BM_BezierBezierTransversal(benchmark::State& state) {
     ta.clear();
     tb.clear();
     pts.clear();
-    CB::FindBezierIntersections(&in.a[4 * i], &in.b[4 * i], ta, tb, pts);
+    CB::FindBezierIntersections(first + stride * i, second + stride * i, ta, tb, pts);
     benchmark::DoNotOptimize(ta.data());
     i = (i + 1) & 255;
   }
+}
+
+void BM_BezierBezierTransversal(benchmark::State& state) {
+  IntersectPairs(state, Data().a.data(), Data().b.data(), 4);
 }
 BENCHMARK(BM_BezierBezierTransversal);
 
@@ -58,20 +63,7 @@ void BM_BezierBezierSmoothJoint(benchmark::State& state) {
   const Inputs& in = Data();
   std::vector<V> halves(8 * 256);
   for (size_t i = 0; i < 256; ++i) CB::Split(0.5, &in.a[4 * i], &halves[8 * i], &halves[8 * i + 4]);
-  std::vector<double> ta, tb;
-  std::vector<V> pts;
-  ta.reserve(16);
-  tb.reserve(16);
-  pts.reserve(16);
-  size_t i = 0;
-  for (auto _ : state) {
-    ta.clear();
-    tb.clear();
-    pts.clear();
-    CB::FindBezierIntersections(&halves[8 * i], &halves[8 * i + 4], ta, tb, pts);
-    benchmark::DoNotOptimize(ta.data());
-    i = (i + 1) & 255;
-  }
+  IntersectPairs(state, halves.data(), halves.data() + 4, 8);
 }
 BENCHMARK(BM_BezierBezierSmoothJoint);
 

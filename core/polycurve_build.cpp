@@ -20,6 +20,7 @@
 #include "ostracrv/math/collinear.h"
 #include "ostracrv/math/matrix.h"
 #include "ostracrv/math/rect.h"
+#include "ostracrv/measure/tangents.h"
 #include "ostracrv/shapes/circular_arc.h"
 #include "ostracrv/shapes/ellipse.h"
 #include "ostracrv/shapes/rectangle.h"
@@ -116,6 +117,22 @@ bool PolycurveT<T>::CircularArcTo(T const& p, D const& tangent) {
   nds[count - 1] = NODETYPE((nds[count - 1] & ~NodeMask::kClosed) | NodeMask::kUser);
   Append(pts + 1, nds + 1, count - 1);
   return true;
+}
+
+template <class T>
+bool PolycurveT<T>::CircularArcTo(T const& p) {
+  const unsigned long n = GetPointCount();
+  if (n == 0) return false;
+  D tangent;
+  if (n == 1) {
+    // With d = p - last point the tangent is (-d.y, d.x): the arc leaves at
+    // right angles to the chord, a half circle turning clockwise.
+    const D d = MavikMath::ToV(p) - MavikMath::ToV(GetLastPoint());
+    tangent = D{-d.y, d.x};
+  } else {
+    tangent = OstraCrv::GetTangentAt(GetPoints(), GetNodeTypes(), n, int(n - 1), 1.0, false);
+  }
+  return CircularArcTo(p, tangent);
 }
 
 // ---- Joining appends -------------------------------------------------------------
@@ -327,6 +344,7 @@ bool PolycurveT<T>::Create3PointArcSubpath(T const& a, T const& b, T const& c) {
   template bool PolycurveT<T>::LineTo(PolycurveT<T>::coordinate_type, PolycurveT<T>::coordinate_type, bool);   \
   template bool PolycurveT<T>::CubicTo(T const&, T const&, T const&);                                          \
   template bool PolycurveT<T>::CircularArcTo(T const&, D const&);                                              \
+  template bool PolycurveT<T>::CircularArcTo(T const&);                                                        \
   template void PolycurveT<T>::PushBackWithJoinCheck(T const&, NODETYPE const&);                               \
   template bool PolycurveT<T>::AppendLineWithJoin(T const*, NODETYPE const&);                                  \
   template bool PolycurveT<T>::AppendBezierWithJoin(T const*, NODETYPE const&);                                \

@@ -52,13 +52,6 @@ Scratch& GetScratch() {
   return scratch;
 }
 
-// The point of a segment's end as stored (for the touch tests, which take the
-// caller's point kind).
-template <class T>
-const T& EndPoint(T const* p, bool bezier, bool atOne) {
-  return p[atOne ? (bezier ? 3 : 1) : 0];
-}
-
 // The crossing of two lines strictly inside both.
 template <class T>
 bool AddLineCrossing(const SegmentGeometry& A, const SegmentGeometry& B, int a, int b, SegmentsT<T>& segments,
@@ -199,19 +192,25 @@ void RunPair(PairKind kind, T const* aPts, T const* bPts, int a, int b, Segments
   }
 
   // 3. Touch pass: an end of one segment on the other; the touched segment
-  // comes first in the record pair.
-  auto touchAOnB = [&](bool atOne) -> bool {
+  // comes first in the record pair. The touching end's tangent and
+  // curvature are computed only for a touch found.
+  const double tts = settings.touchToleranceSquared;
+  auto touch = [&](const SegmentGeometry& touched, int touchedSegment, const SegmentGeometry& end, int endSegment,
+                   bool atOne) -> bool {
     const double t = atOne ? 1.0 : 0.0;
-    const T& pt = EndPoint(aPts, aBezier, atOne);
-    if (bBezier) return TouchBezier(bPts, b, pt, a, A.Tangent(t), A.Curvature(t), t, segments, settings);
-    return TouchLine(bPts, b, B.Tangent(0.0), pt, a, A.Tangent(t), A.Curvature(t), t, segments, settings);
+    IntersectionCandidate c;
+    const bool found =
+        touched.bezier
+            ? TouchBezierCandidate(touched, touchedSegment, end.EndAt(atOne), endSegment, D{}, 0.0, t, tts, c)
+            : TouchLineCandidate(touched.p, touchedSegment, touched.Tangent(0.0), end.EndAt(atOne), endSegment, D{},
+                                 0.0, t, tts, c);
+    if (!found) return false;
+    c.second.otherTangent = end.Tangent(t);
+    c.second.otherCurvature = end.Curvature(t);
+    return AddCandidate(c.second, segments, normalize, true).first != nullptr;
   };
-  auto touchBOnA = [&](bool atOne) -> bool {
-    const double t = atOne ? 1.0 : 0.0;
-    const T& pt = EndPoint(bPts, bBezier, atOne);
-    if (aBezier) return TouchBezier(aPts, a, pt, b, B.Tangent(t), B.Curvature(t), t, segments, settings);
-    return TouchLine(aPts, a, A.Tangent(0.0), pt, b, B.Tangent(t), B.Curvature(t), t, segments, settings);
-  };
+  auto touchAOnB = [&](bool atOne) { return touch(B, b, A, a, atOne); };
+  auto touchBOnA = [&](bool atOne) { return touch(A, a, B, b, atOne); };
   if (!(f00 || f01 || hitA0)) hitA0 = touchAOnB(false);
   if (!(f10 || f11 || hitA1)) hitA1 = touchAOnB(true);
   if (!(f00 || f10 || hitB0)) hitB0 = touchBOnA(false);

@@ -47,9 +47,13 @@ bool TouchLineCandidate(const V* line, int lineSegment, const D& lineTangent, co
 bool TouchBezierCandidate(const SegmentGeometry& bezier, int bezierSegment, const V& point, int pointSegment,
                           const D& pointTangent, double pointCurvature, double pointT, double squaredTolerance,
                           IntersectionCandidate& out) noexcept {
+  // Only points closer than the tolerance matter, so the search starts with
+  // the tolerance as the best distance known: a curve whose control points
+  // all lie farther away is rejected at once, and otherwise the answer is the
+  // nearest point, as from an unbounded search.
   double u = 0.0;
   V nearest;
-  double distance = std::numeric_limits<double>::max();
+  double distance = squaredTolerance;
   if (!MavikMath::CubicBezier::FindClosestPointOnBezier(bezier.p, point, u, nearest, distance)) return false;
   if (!(distance < squaredTolerance)) return false;
   out.first = nearest;

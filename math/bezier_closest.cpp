@@ -5,11 +5,11 @@
 //     other or to an end are one point: the roots themselves are only about
 //     that accurate where two of them come close.
 //   Four Newton steps polish a root that root isolation already found to
-//     near full precision in the power basis; a step is kept only if the
-//     distance does not grow.
+//     near full precision in the power basis; a step is kept only if it
+//     brings the point closer.
 #include "ostracrv/math/bezier_closest.h"
 
-#include "bezier_search_common.h"
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_basis.h"
 #include "ostracrv/math/polynomial.h"
 
@@ -17,7 +17,7 @@ namespace MavikMath::CubicBezier {
 
 namespace {
 
-using namespace search_detail;
+using namespace internal;
 using Framework::common_types::POINT;
 
 constexpr double kMergeTolerance = 1e-12;
@@ -29,35 +29,6 @@ double StationaryValue(const V* q, double t) noexcept {
   D d1;
   PointAndTangent(q, t, b, d1);
   return b.x * d1.x + b.y * d1.y;
-}
-
-// Newton on g, kept inside [lo, hi]; a step that moves away from a minimum
-// (g' <= 0) or increases the distance is not taken.
-double Polish(const V* q, double t, double lo, double hi) noexcept {
-  V b;
-  D d1, d2;
-  PointAndDerivatives(q, t, b, d1, d2);
-  double f = b.SquaredLength();
-  for (int i = 0; i < kPolishSteps; ++i) {
-    const double g = Dot(b, d1);
-    const double gp = Dot(d1, d1) + Dot(b, d2);
-    if (!(gp > 0.0) || g == 0.0) break;
-    double next = t - g / gp;
-    if (next < lo) next = lo;
-    if (next > hi) next = hi;
-    if (next == t) break;
-    V nb;
-    D nd1, nd2;
-    PointAndDerivatives(q, next, nb, nd1, nd2);
-    const double nf = nb.SquaredLength();
-    if (!(nf <= f)) break;
-    t = next;
-    b = nb;
-    d1 = nd1;
-    d2 = nd2;
-    f = nf;
-  }
-  return t;
 }
 
 // Common preparation: the curve moved so that the target is the origin.
@@ -75,13 +46,8 @@ bool Prepare(const T* p, const T& target, V* raw, V* q, V& origin) noexcept {
 // Squared distance from the origin to the control-point box of q, a lower
 // bound of the distance to the curve.
 double BoxSquaredDistance(const V* q) noexcept {
-  double lx = q[0].x, hx = q[0].x, ly = q[0].y, hy = q[0].y;
-  for (int i = 1; i < 4; ++i) {
-    lx = std::min(lx, q[i].x);
-    hx = std::max(hx, q[i].x);
-    ly = std::min(ly, q[i].y);
-    hy = std::max(hy, q[i].y);
-  }
+  double lx, hx, ly, hy;
+  ControlBox(q, lx, hx, ly, hy);
   const double dx = lx > 0.0 ? lx : (hx < 0.0 ? -hx : 0.0);
   const double dy = ly > 0.0 ? ly : (hy < 0.0 ? -hy : 0.0);
   return dx * dx + dy * dy;
@@ -104,8 +70,8 @@ bool FindClosestPointOnBezier(const T* p, const T& target, double& t, T& point, 
   double bestT = 0.0;
   double bestD = q[0].SquaredLength();
   for (int i = 0; i < n; ++i) {
-    const double r = Polish(q, roots[i], 0.0, 1.0);
-    const double d = PointAt(q, r).SquaredLength();
+    double r = roots[i];
+    const double d = PolishNearest(q, V{0.0, 0.0}, r, 0.0, 1.0, kPolishSteps);
     if (d < bestD) {
       bestD = d;
       bestT = r;
@@ -160,10 +126,12 @@ bool FindClosestPointsOnBezier(const T* p, const T& target, std::vector<double>&
       isMin = sign[j - 1] <= 0 && sign[j] >= 0 && !(sign[j - 1] == 0 && sign[j] == 0);
     }
     if (!isMin) continue;
-    const double t = (j == 0 || j == m - 1) ? nodes[j] : Polish(q, nodes[j], nodes[j - 1], nodes[j + 1]);
+    double t = nodes[j];
+    const double d = (j == 0 || j == m - 1) ? Evaluate(q, t).SquaredLength()
+                                            : PolishNearest(q, V{0.0, 0.0}, t, nodes[j - 1], nodes[j + 1], kPolishSteps);
     ts.push_back(t);
     points.push_back(FromV<T>(Evaluate(raw, t)));
-    squaredDistances.push_back(PointAt(q, t).SquaredLength());
+    squaredDistances.push_back(d);
     any = true;
   }
   return any;

@@ -14,27 +14,19 @@
 #include <algorithm>
 #include <cmath>
 
+#include "bezier_common.h"
 #include "ostracrv/math/polynomial.h"
 
 namespace MavikMath::CubicBezier {
 
 namespace {
 
+using internal::PowerOfTwoScale;
+
 constexpr double kStep = 1e-6;
 constexpr double kCluster = 1e-5;
 
 bool AllFinite(const V& a, const V& b, const V& c) noexcept { return a.IsFinite() && b.IsFinite() && c.IsFinite(); }
-
-// A power of two near the largest coefficient magnitude, so that dividing by
-// it is exact and brings the coefficients near 1 (no overflow in products).
-double ScaleOf(const V& a, const V& b, const V& c) noexcept {
-  const double m = std::max({std::fabs(a.x), std::fabs(a.y), std::fabs(b.x), std::fabs(b.y), std::fabs(c.x),
-                             std::fabs(c.y)});
-  if (m == 0.0) return 0.0;
-  int e = 0;
-  std::frexp(m, &e);
-  return std::ldexp(1.0, e);
-}
 
 // Roots in [0, 1] of q2 t^2 + q1 t + q0, ascending; returns the count.
 int AxisRoots(double q2, double q1, double q0, double ts[2]) noexcept {
@@ -51,13 +43,6 @@ int AxisRoots(double q2, double q1, double q0, double ts[2]) noexcept {
   for (int i = 0; i < k; ++i)
     if (r[i] >= 0.0 && r[i] <= 1.0) ts[n++] = r[i];
   return n;
-}
-
-// Polynomial product, ascending coefficients; out must hold na + nb - 1.
-void Multiply(const double* pa, int na, const double* pb, int nb, double* out) noexcept {
-  for (int i = 0; i < na + nb - 1; ++i) out[i] = 0.0;
-  for (int i = 0; i < na; ++i)
-    for (int j = 0; j < nb; ++j) out[i + j] += pa[i] * pb[j];
 }
 
 }  // namespace
@@ -81,7 +66,7 @@ D SafeBezierTangent(double t, const V& a, const V& b, const V& c, const V& /*d*/
 
 double SafeBezierCurvature(double t, const V& a, const V& b, const V& c) noexcept {
   if (!std::isfinite(t) || !AllFinite(a, b, c)) return 0.0;
-  const double s = ScaleOf(a, b, c);
+  const double s = PowerOfTwoScale(a, b, c);
   if (s == 0.0) return 0.0;
   if (!(Derivative(a, b, c, t).SquaredLength() > kEpsilon)) t = t + kStep <= 1.0 ? t + kStep : t - kStep;
   // Curvature scales as 1 / size: work on coefficients near 1, then rescale.
@@ -96,7 +81,7 @@ double SafeBezierCurvature(double t, const V& a, const V& b, const V& c) noexcep
 
 bool GetCurvatureRadiusAt(double t, const V& a, const V& b, const V& c, double& radius) noexcept {
   if (!std::isfinite(t) || !AllFinite(a, b, c)) return false;
-  const double s = ScaleOf(a, b, c);
+  const double s = PowerOfTwoScale(a, b, c);
   if (s == 0.0) return false;
   const V sa = a / s, sb = b / s, sc = c / s;
   const D d1 = Derivative(sa, sb, sc, t);
@@ -112,29 +97,13 @@ bool GetCurvatureRadiusAt(double t, const V& a, const V& b, const V& c, double& 
 
 int FindCurvatureMinMax(const V& a0, const V& b0, const V& c0, double* params) noexcept {
   if (!params || !AllFinite(a0, b0, c0)) return 0;
-  const double s = ScaleOf(a0, b0, c0);
+  const double s = PowerOfTwoScale(a0, b0, c0);
   if (s == 0.0) return 0;
   // The parameters of the extrema do not depend on the size of the curve.
   const V a = a0 / s, b = b0 / s, c = c0 / s;
-  const double axb = Cross(a, b), cxa = Cross(c, a), cxb = Cross(c, b);
-  const double aa = Dot(a, a), ab = Dot(a, b), ac = Dot(a, c), bb = Dot(b, b), bc = Dot(b, c), cc = Dot(c, c);
-  // cross(B', B''') = 6 (c x a) - 12 (a x b) t
-  const double crossD1D3[2] = {6.0 * cxa, -12.0 * axb};
-  // |B'|^2
-  const double speed2[5] = {cc, 4.0 * bc, 4.0 * bb + 6.0 * ac, 12.0 * ab, 9.0 * aa};
-  // cross(B', B'') = 2 (c x b) + 6 (c x a) t - 6 (a x b) t^2
-  const double crossD1D2[3] = {2.0 * cxb, 6.0 * cxa, -6.0 * axb};
-  // B' . B''
-  const double dotD1D2[4] = {2.0 * bc, 4.0 * bb + 6.0 * ac, 18.0 * ab, 18.0 * aa};
-  double p1[6], p2[6], n[6];
-  Multiply(crossD1D3, 2, speed2, 5, p1);
-  Multiply(crossD1D2, 3, dotD1D2, 4, p2);
-  bool any = false;
-  for (int i = 0; i < 6; ++i) {
-    n[i] = p1[i] - 3.0 * p2[i];
-    any = any || n[i] != 0.0;
-  }
-  if (!any) return 0;  // straight: the curvature is zero everywhere
+  double n[6];
+  internal::CurvatureSlopePolynomial(a, b, c, n);
+  if (std::all_of(n, n + 6, [](double x) { return x == 0.0; })) return 0;  // straight: no curvature
   double roots[5];
   const int k = FindRootsInInterval(n, 5, 0.0, 1.0, roots);
   if (k == 0) return 0;

@@ -13,12 +13,15 @@
 #include <algorithm>
 #include <cmath>
 
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_basis.h"
 
 namespace MavikMath {
 
 namespace {
 
+using CubicBezier::internal::LoadFinite;
+using CubicBezier::internal::SplitPoints;
 using Framework::common_types::POINT;
 using Framework::common_types::RECT;
 
@@ -39,19 +42,6 @@ double Steps(const V* q, double tol) noexcept {
   return std::min(k, kMaxSteps);
 }
 
-void Halve(const V* q, V* left, V* right) noexcept {
-  const V a = Lerp(q[0], q[1], 0.5), b = Lerp(q[1], q[2], 0.5), c = Lerp(q[2], q[3], 0.5);
-  const V d = Lerp(a, b, 0.5), e = Lerp(b, c, 0.5), m = Lerp(d, e, 0.5);
-  left[0] = q[0];
-  left[1] = a;
-  left[2] = d;
-  left[3] = m;
-  right[0] = m;
-  right[1] = e;
-  right[2] = c;
-  right[3] = q[3];
-}
-
 // Calls emit(point, isLast) for each vertex after the start, in order; stops
 // early, returning false, when emit does.
 template <class Emit>
@@ -68,10 +58,10 @@ bool Flatten(const V* p, double tol, Emit&& emit) noexcept {
     const bool lastPiece = top == 0;
     const double k = Steps(piece.q, tol);
     if (k > 1.0 && piece.depth < kMaxDepth) {
-      Piece left, right;
-      Halve(piece.q, left.q, right.q);
+      V o[7];
+      SplitPoints(piece.q, 0.5, o);
+      const Piece left{{o[0], o[1], o[2], o[3]}, piece.depth + 1}, right{{o[3], o[4], o[5], o[6]}, piece.depth + 1};
       if (Steps(left.q, tol) + Steps(right.q, tol) < k) {
-        left.depth = right.depth = piece.depth + 1;
         stack[top++] = right;
         stack[top++] = left;
         continue;
@@ -82,13 +72,6 @@ bool Flatten(const V* p, double tol, Emit&& emit) noexcept {
       if (!emit(CubicBezier::Evaluate(piece.q, double(j) / double(steps)), false)) return false;
     if (!emit(piece.q[3], lastPiece)) return false;
   }
-  return true;
-}
-
-template <class T>
-bool LoadFinite(const T* p, V* v) noexcept {
-  if (!CubicBezier::IsFinite(p)) return false;
-  for (int i = 0; i < 4; ++i) v[i] = ToV(p[i]);
   return true;
 }
 

@@ -32,7 +32,7 @@
 #include <cmath>
 #include <limits>
 
-#include "bezier_search_common.h"
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_closest.h"
 #include "ostracrv/math/bezier_split.h"
 #include "ostracrv/math/polynomial.h"
@@ -41,7 +41,7 @@ namespace MavikMath::CubicBezier {
 
 namespace {
 
-using namespace search_detail;
+using namespace internal;
 using Framework::common_types::POINT;
 
 constexpr double kLeafWidth = 1e-10;
@@ -72,27 +72,16 @@ struct Candidate {
   double err2;  // squared distance of the two curve points; -1 for exact stretch ends
 };
 
-void Box(const V* p, double& lx, double& hx, double& ly, double& hy) noexcept {
-  lx = hx = p[0].x;
-  ly = hy = p[0].y;
-  for (int i = 1; i < 4; ++i) {
-    lx = std::min(lx, p[i].x);
-    hx = std::max(hx, p[i].x);
-    ly = std::min(ly, p[i].y);
-    hy = std::max(hy, p[i].y);
-  }
-}
-
 bool BoxesOverlap(const V* p, const V* q, double tol) noexcept {
   double plx, phx, ply, phy, qlx, qhx, qly, qhy;
-  Box(p, plx, phx, ply, phy);
-  Box(q, qlx, qhx, qly, qhy);
+  ControlBox(p, plx, phx, ply, phy);
+  ControlBox(q, qlx, qhx, qly, qhy);
   return plx <= qhx + tol && qlx <= phx + tol && ply <= qhy + tol && qly <= phy + tol;
 }
 
 double ExtentSquared(const V* p) noexcept {
   double lx, hx, ly, hy;
-  Box(p, lx, hx, ly, hy);
+  ControlBox(p, lx, hx, ly, hy);
   return (hx - lx) * (hx - lx) + (hy - ly) * (hy - ly);
 }
 

@@ -58,6 +58,7 @@
 #include <limits>
 #include <utility>
 
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_basis.h"
 
 namespace MavikMath::CubicBezier {
@@ -181,12 +182,8 @@ class Speed {
   // Returns false for a point curve or non-finite input.
   bool Init(const V& a, const V& b, const V& c, LengthAccuracy accuracy) noexcept {
     if (!a.IsFinite() || !b.IsFinite() || !c.IsFinite()) return false;
-    const double m = std::max({std::fabs(a.x), std::fabs(a.y), std::fabs(b.x), std::fabs(b.y), std::fabs(c.x),
-                               std::fabs(c.y)});
-    if (m == 0.0) return false;
-    int e = 0;
-    std::frexp(m, &e);
-    scale_ = std::ldexp(1.0, e);
+    scale_ = internal::PowerOfTwoScale(a, b, c);
+    if (scale_ == 0.0) return false;
     // Dividing by a power of two is exact; the coefficients are now near 1.
     ax_ = 3.0 * a.x / scale_;
     ay_ = 3.0 * a.y / scale_;

@@ -18,14 +18,14 @@
 #include <algorithm>
 #include <cmath>
 
-#include "bezier_search_common.h"
+#include "bezier_common.h"
 #include "ostracrv/math/polynomial.h"
 
 namespace MavikMath::CubicBezier {
 
 namespace {
 
-using namespace search_detail;
+using namespace internal;
 using Framework::common_types::POINT;
 
 constexpr double kEndSlack = 1e-12;
@@ -39,14 +39,6 @@ constexpr double kMergeWidth = 1e-9;
 void SortSmall(double* v, int n) noexcept {
   for (int i = 1; i < n; ++i)
     for (int j = i; j > 0 && v[j] < v[j - 1]; --j) std::swap(v[j], v[j - 1]);
-}
-
-// The cubic Bernstein function with coefficients e at t (de Casteljau).
-double BernsteinValue(const double* e, double t) noexcept {
-  const double s = 1.0 - t;
-  const double a0 = e[0] * s + e[1] * t, a1 = e[1] * s + e[2] * t, a2 = e[2] * s + e[3] * t;
-  const double b0 = a0 * s + a1 * t, b1 = a1 * s + a2 * t;
-  return b0 * s + b1 * t;
 }
 
 bool Along(const double* e, double tol) noexcept {
@@ -82,10 +74,8 @@ int Roots(const double* e, double endSlack, bool tangential, double tangentTol, 
     if (keep) out[m++] = snapped;
   }
   if (tangential) {
-    // f'(t)/3 = k0 (1-t)^2 + 2 k1 t (1-t) + k2 t^2.
-    const double k0 = e[1] - e[0], k1 = e[2] - e[1], k2 = e[3] - e[2];
     double q[2];
-    const int nq = SolveQuadratic(k0 - 2.0 * k1 + k2, 2.0 * (k1 - k0), k0, q);
+    const int nq = BernsteinStationary(e, q);
     for (int i = 0; i < nq; ++i)
       if (q[i] >= 0.0 && q[i] <= 1.0 && std::fabs(BernsteinValue(e, q[i])) <= tangentTol) out[m++] = q[i];
   }

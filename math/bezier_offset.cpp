@@ -35,6 +35,7 @@
 #include <array>
 #include <cmath>
 
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_split.h"
 #include "ostracrv/math/least_squares.h"
 #include "ostracrv/math/polynomial.h"
@@ -72,10 +73,10 @@ using ParamList = std::array<double, 64>;
 struct Unit {
   double size = 0.0;
   double dist = 0.0;
-  D a, b, c;
+  V a, b, c;
 
-  D D1(double t) const noexcept { return D{(3.0 * a.x * t + 2.0 * b.x) * t + c.x, (3.0 * a.y * t + 2.0 * b.y) * t + c.y}; }
-  D D2(double t) const noexcept { return D{6.0 * a.x * t + 2.0 * b.x, 6.0 * a.y * t + 2.0 * b.y}; }
+  D D1(double t) const noexcept { return CubicBezier::Derivative(a, b, c, t); }
+  D D2(double t) const noexcept { return CubicBezier::SecondDerivative(a, b, t); }
   // h(t) = |B'|^3 - d cross(B', B''): the sign of 1 - d kappa, the factor by
   // which the offset moves along B'.
   double H(double t) const noexcept {
@@ -85,14 +86,17 @@ struct Unit {
   }
   // Direction of travel at t, defined also where B' vanishes: the limit of
   // B' from inside the curve (B'' at a degenerate handle, B''' if that
-  // vanishes too).
+  // vanishes too). Not SafeBezierTangent: pieces end at their cusps, so the
+  // fallback must point into the piece from the nearer end (reversed past
+  // the middle, not only at t = 1), and the threshold is the cusp one of
+  // this unit-size frame, far below kEpsilon.
   D Tangent(double t) const noexcept {
     const D d1 = D1(t);
     if (d1.SquaredLength() > kCuspSpeedSqr) return d1;
     D d2 = D2(t);
     if (t > 0.5) d2 = -d2;
     if (d2.SquaredLength() > kCuspSpeedSqr) return d2;
-    return a;
+    return D(a);
   }
 };
 
@@ -107,12 +111,14 @@ bool MakeUnit(const V* p, double distance, Unit& u) noexcept {
   V q[4];
   for (int i = 0; i < 4; ++i) q[i] = V{(p[i].x - p[0].x) / u.size, (p[i].y - p[0].y) / u.size};
   const CubicBezier::PowerBasis pb = CubicBezier::GetPowerBasis(q);
-  u.a = D(pb.a);
-  u.b = D(pb.b);
-  u.c = D(pb.c);
+  u.a = pb.a;
+  u.b = pb.b;
+  u.c = pb.c;
   return true;
 }
 
+// Normalised whatever the length: tangents of the unit frame may be far
+// shorter than the kEpsilon threshold of D::Normalize and still point true.
 D UnitVector(const D& v) noexcept {
   const double len = std::sqrt(v.SquaredLength());
   return len > 0.0 ? D{v.x / len, v.y / len} : D{0.0, 0.0};
@@ -123,9 +129,7 @@ D UnitVector(const D& v) noexcept {
 bool IsDot(const V* p, double t0, double t1) noexcept {
   V q[4];
   CubicBezier::Subsection(t0, t1, p, q);
-  double s2 = 0.0;
-  for (int i = 1; i < 4; ++i) s2 = std::max(s2, SquaredDistance(q[i], q[0]));
-  return !(s2 > kEpsilon);
+  return CubicBezier::internal::IsDot(q);
 }
 // Whether t splits p into two parts that are not dots. Near a cusp the
 // parameter says little about size (the speed vanishes), so this is
@@ -161,34 +165,14 @@ int Cusps(const Unit& u, double* out) noexcept {
   return m;
 }
 
-// Polynomial product, ascending coefficients.
-template <std::size_t N, std::size_t M>
-std::array<double, N + M - 1> Multiply(const std::array<double, N>& p, const std::array<double, M>& q) noexcept {
-  std::array<double, N + M - 1> r{};
-  for (std::size_t i = 0; i < N; ++i)
-    for (std::size_t j = 0; j < M; ++j) r[i + j] += p[i] * q[j];
-  return r;
-}
-
-// Curvature extrema: roots of cross(B', B''') |B'|^2 - 3 cross(B', B'') (B'.B'').
+// Curvature extrema and cusps: every root of the slope of the curvature.
+// Not FindCurvatureMinMax: these only end stretches of the search below,
+// where a spare root (a flat point of the curvature) does no harm; its
+// merging and sign tests are not needed and cost the cutting a few per cent.
 int CurvatureExtrema(const Unit& u, double* out) noexcept {
-  const std::array<double, 3> px{u.c.x, 2.0 * u.b.x, 3.0 * u.a.x}, py{u.c.y, 2.0 * u.b.y, 3.0 * u.a.y};
-  const std::array<double, 2> qx{2.0 * u.b.x, 6.0 * u.a.x}, qy{2.0 * u.b.y, 6.0 * u.a.y};
-  // cross(B', B''): the cubic term cancels exactly.
-  const auto c1 = Multiply(px, qy), c2 = Multiply(py, qx);
-  const std::array<double, 3> cr{c1[0] - c2[0], c1[1] - c2[1], c1[2] - c2[2]};
-  const std::array<double, 2> crd{cr[1], 2.0 * cr[2]};
-  const auto sx = Multiply(px, px), sy = Multiply(py, py);
-  std::array<double, 5> speed{};
-  for (int i = 0; i < 5; ++i) speed[i] = sx[i] + sy[i];
-  const auto dx = Multiply(px, qx), dy = Multiply(py, qy);
-  std::array<double, 4> dot{};
-  for (int i = 0; i < 4; ++i) dot[i] = dx[i] + dy[i];
-  const auto left = Multiply(crd, speed);   // degree 5
-  const auto right = Multiply(cr, dot);     // degree 5
-  double e[6];
-  for (int i = 0; i < 6; ++i) e[i] = left[i] - 3.0 * right[i];
-  return FindRootsInInterval(e, 5, 0.0, 1.0, out);
+  double n[6];
+  CubicBezier::internal::CurvatureSlopePolynomial(u.a, u.b, u.c, n);
+  return FindRootsInInterval(n, 5, 0.0, 1.0, out);
 }
 
 // Sign of h near t, looking towards `other` where B' vanishes at t (h is 0
@@ -277,27 +261,6 @@ V OffsetPoint(const V* p, const Unit& u, double distance, double t) noexcept {
   const V b = t == 1.0 ? p[3] : CubicBezier::Evaluate(p, t);
   const D n = UnitVector(u.Tangent(t)).Perpendicular();
   return b + n * distance;
-}
-
-// Squared distance from q to the cubic f, refined from parameter u by at
-// most four Newton steps that each must bring the point closer.
-double DistanceToCubic(const V* f, const CubicBezier::PowerBasis& pb, const V& q, double u) noexcept {
-  double best = SquaredDistance(CubicBezier::Evaluate(f, u), q);
-  for (int k = 0; k < 4; ++k) {
-    const V b = CubicBezier::Evaluate(f, u);
-    const D d1 = CubicBezier::Derivative(pb.a, pb.b, pb.c, u);
-    const D d2 = CubicBezier::SecondDerivative(pb.a, pb.b, u);
-    const D diff = b - q;
-    const double fp = Dot(d1, d1) + Dot(diff, d2);
-    if (!(fp > 0.0)) break;
-    const double next = std::clamp(u - Dot(diff, d1) / fp, 0.0, 1.0);
-    if (next == u) break;
-    const double there = SquaredDistance(CubicBezier::Evaluate(f, next), q);
-    if (!(there < best)) break;
-    best = there;
-    u = next;
-  }
-  return best;
 }
 
 // Parameters at which the offset is sampled: sixteenths, each interval
@@ -457,12 +420,13 @@ bool FindBezierOffsetCurve(const V* p, V* result, double distance, double square
     bool ok = error < accept;
     for (int j = 0; ok && j + 1 < count; ++j) ok = params[j + 1] >= params[j];
     // Check the quarter points between samples against the true offset.
-    const CubicBezier::PowerBasis pb = CubicBezier::GetPowerBasis(fit);
+    // Four Newton steps from the arc-length guess: the fit follows the
+    // samples, so the guess is already near the foot.
     for (int j = 0; ok && j + 1 < count; ++j) {
       for (int k = 1; ok && k < 4; ++k) {
         const double t = ts[j] + (ts[j + 1] - ts[j]) * 0.25 * k;
-        const double guess = params[j] + (params[j + 1] - params[j]) * 0.25 * k;
-        ok = DistanceToCubic(fit, pb, OffsetPoint(p, u, distance, t), guess) < accept;
+        double guess = params[j] + (params[j + 1] - params[j]) * 0.25 * k;
+        ok = CubicBezier::internal::PolishNearest(fit, OffsetPoint(p, u, distance, t), guess, 0.0, 1.0, 4) < accept;
       }
     }
     if (ok) {

@@ -14,14 +14,14 @@
 #include <algorithm>
 #include <cmath>
 
-#include "bezier_search_common.h"
+#include "bezier_common.h"
 #include "ostracrv/math/polynomial.h"
 
 namespace MavikMath::CubicBezier {
 
 namespace {
 
-using namespace search_detail;
+using namespace internal;
 using Framework::common_types::POINT;
 
 constexpr double kEndSlack = 1e-9;

@@ -8,14 +8,15 @@
 
 #include <limits>
 
-#include "bezier_search_common.h"
+#include "bezier_common.h"
 #include "ostracrv/math/bezier_closest.h"
+#include "ostracrv/math/bezier_derivatives.h"
 
 namespace MavikMath::CubicBezier {
 
 namespace {
 
-using namespace search_detail;
+using internal::Magnitude;
 using Framework::common_types::POINT;
 
 constexpr double kOnCurveUlps = 64.0;
@@ -29,30 +30,6 @@ void ControlPoints(const V& a, const V& b, const V& c, const V& d, V* p) noexcep
   p[3] = V{a.x + b.x + c.x + d.x, a.y + b.y + c.y + d.y};
 }
 
-// Direction of travel at t. Where the derivative vanishes the curve leaves
-// t along the second derivative (and arrives at t = 1 against it); where
-// that vanishes too, along the third, which keeps its sign through t.
-// False if no derivative has length.
-bool SafeDirection(const V* q, double t, D& dir) noexcept {
-  V b;
-  D d1, d2;
-  PointAndDerivatives(q, t, b, d1, d2);
-  if (d1.SquaredLength() > kEpsilon) {
-    dir = d1;
-    return true;
-  }
-  if (d2.SquaredLength() > kEpsilon) {
-    dir = t >= 1.0 ? -d2 : d2;
-    return true;
-  }
-  const D d3{6.0 * (q[3].x - 3.0 * (q[2].x - q[1].x) - q[0].x), 6.0 * (q[3].y - 3.0 * (q[2].y - q[1].y) - q[0].y)};
-  if (d3.SquaredLength() > kEpsilon) {
-    dir = d3;
-    return true;
-  }
-  return false;
-}
-
 }  // namespace
 
 template <class T>
@@ -64,8 +41,8 @@ bool GetSide(const T& target, const V& a, const V& b, const V& c, const V& d, do
   double u = 0.0, dist = std::numeric_limits<double>::max();
   V foot;
   if (!FindClosestPointOnBezier(p, P, u, foot, dist)) return false;
-  D dir;
-  if (!SafeDirection(p, u, dir)) return false;
+  const D dir = SafeBezierTangent(u, a, b, c, d);
+  if (dir.x == 0.0 && dir.y == 0.0) return false;
 
   const double mag = std::max(Magnitude(p, 4), std::max(std::fabs(P.x), std::fabs(P.y)));
   const double onCurve = kOnCurveUlps * kEpsilon * mag;

@@ -3,25 +3,14 @@
 
 #include <utility>
 
+#include "bezier_common.h"
+
 namespace MavikMath::CubicBezier {
 
 namespace {
 
 using Framework::common_types::POINT;
-
-// Seven points of the split at t, in doubles; ends copied exactly.
-void SplitD(double t, const V* p, V* o) noexcept {
-  const V q0 = Lerp(p[0], p[1], t), q1 = Lerp(p[1], p[2], t), q2 = Lerp(p[2], p[3], t);
-  const V r0 = Lerp(q0, q1, t), r1 = Lerp(q1, q2, t);
-  const V s = Lerp(r0, r1, t);
-  o[0] = p[0];
-  o[1] = q0;
-  o[2] = r0;
-  o[3] = s;
-  o[4] = r1;
-  o[5] = q2;
-  o[6] = p[3];
-}
+using internal::SplitPoints;
 
 template <class T>
 void Load(const T* p, V* v) noexcept {
@@ -41,7 +30,7 @@ template <class T>
 void Split(double t, const T* p, T* left, T* right) noexcept {
   V in[4], o[7];
   Load(p, in);
-  SplitD(t, in, o);
+  SplitPoints(in, t, o);
   Store(o, left, 4);
   Store(o + 3, right, 4);
 }
@@ -50,7 +39,7 @@ template <class T>
 void Split(double t, const T* p, T* out) noexcept {
   V in[4], o[7];
   Load(p, in);
-  SplitD(t, in, o);
+  SplitPoints(in, t, o);
   Store(o, out, 7);
 }
 
@@ -59,12 +48,12 @@ void Split(double t1, double t2, const T* p, T* out) noexcept {
   if (t2 < t1) std::swap(t1, t2);
   V in[4], first[7], second[7];
   Load(p, in);
-  SplitD(t1, in, first);
+  SplitPoints(in, t1, first);
   // The second cut lies on the right part at the rescaled parameter; when t1
   // is 1 the right part is a point and any parameter gives it.
   const double rest = 1.0 - t1;
   const double u = rest > 0.0 ? (t2 - t1) / rest : 0.0;
-  SplitD(u, first + 3, second);
+  SplitPoints(first + 3, u, second);
   V o[10];
   for (int i = 0; i < 4; ++i) o[i] = first[i];
   for (int i = 1; i < 7; ++i) o[3 + i] = second[i];
@@ -75,7 +64,7 @@ template <class T>
 void LeftOf(double t, const T* p, T* out) noexcept {
   V in[4], o[7];
   Load(p, in);
-  SplitD(t, in, o);
+  SplitPoints(in, t, o);
   Store(o, out, 4);
 }
 
@@ -83,7 +72,7 @@ template <class T>
 void RightOf(double t, const T* p, T* out) noexcept {
   V in[4], o[7];
   Load(p, in);
-  SplitD(t, in, o);
+  SplitPoints(in, t, o);
   Store(o + 3, out, 4);
 }
 
@@ -101,19 +90,19 @@ void Subsection(double t0, double t1, const T* p, T* out) noexcept {
     return;
   }
   if (t0 == 0.0) {
-    SplitD(t1, in, a);
+    SplitPoints(in, t1, a);
     Store(a, out, 4);
     return;
   }
   // Right of t0, then the left part of that up to t1 rescaled.
-  SplitD(t0, in, a);
+  SplitPoints(in, t0, a);
   if (t1 == 1.0) {
     Store(a + 3, out, 4);
     return;
   }
   const double rest = 1.0 - t0;
   const double u = rest != 0.0 ? (t1 - t0) / rest : 0.0;
-  SplitD(u, a + 3, b);
+  SplitPoints(a + 3, u, b);
   Store(b, out, 4);
 }
 

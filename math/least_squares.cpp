@@ -27,6 +27,8 @@
 #include <cmath>
 #include <vector>
 
+#include "bezier_common.h"
+
 namespace MavikMath {
 
 namespace {
@@ -43,25 +45,16 @@ constexpr double kNoise = 1e-15;
 constexpr int kPolishSteps = 4;
 constexpr int kStackSamples = 64;
 
-// The fitted cubic relative to its first point: p0 = (0, 0).
+// The fitted cubic relative to its first point: p[0] = (0, 0).
 struct Curve {
-  D p1, p2, p3;
+  V p[4];
 
-  // B(u), B'(u) from the power basis a = p3 - 3(p2 - p1), b = 3(p2 - 2 p1),
-  // c = 3 p1; and B''(u).
+  // B(u), B'(u) and B''(u) from the power basis.
   void Eval(double u, D& b, D& d1, D& d2) const noexcept {
-    const double ax = p3.x - 3.0 * (p2.x - p1.x), ay = p3.y - 3.0 * (p2.y - p1.y);
-    const double bx = 3.0 * (p2.x - 2.0 * p1.x), by = 3.0 * (p2.y - 2.0 * p1.y);
-    const double cx = 3.0 * p1.x, cy = 3.0 * p1.y;
-    b = D{((ax * u + bx) * u + cx) * u, ((ay * u + by) * u + cy) * u};
-    d1 = D{(3.0 * ax * u + 2.0 * bx) * u + cx, (3.0 * ay * u + 2.0 * by) * u + cy};
-    d2 = D{6.0 * ax * u + 2.0 * bx, 6.0 * ay * u + 2.0 * by};
-  }
-  // Bernstein form: exact at u = 0 and u = 1.
-  D Point(double u) const noexcept {
-    const double s = 1.0 - u;
-    const double b1 = 3.0 * s * s * u, b2 = 3.0 * s * u * u, b3 = u * u * u;
-    return D{p1.x * b1 + p2.x * b2 + p3.x * b3, p1.y * b1 + p2.y * b2 + p3.y * b3};
+    const CubicBezier::PowerBasis pb = CubicBezier::GetPowerBasis(p);
+    b = D(CubicBezier::Evaluate(pb.a, pb.b, pb.c, pb.d, u));
+    d1 = CubicBezier::Derivative(pb.a, pb.b, pb.c, u);
+    d2 = CubicBezier::SecondDerivative(pb.a, pb.b, u);
   }
 };
 
@@ -81,30 +74,16 @@ struct Problem {
   D t1, t2, end;  // unit tangents and the last sample, relative
   double lo;      // lower bound of the handles
   double fallback;
-  Curve Make(double alpha, double beta) const noexcept { return Curve{t1 * alpha, end - t2 * beta, end}; }
+  Curve Make(double alpha, double beta) const noexcept {
+    return Curve{{V{0.0, 0.0}, V(t1 * alpha), V(end - t2 * beta), V(end)}};
+  }
 };
 
-// One Newton step of u towards the nearest point of the curve to q, on
-// f(u) = (B(u) - q).B'(u) with f' = |B'|^2 + (B - q).B''; kept only if it
-// brings the curve point closer. Returns the squared distance at the final u.
+// One Newton step of u towards the nearest point of the curve to q, kept
+// only if it brings the curve point closer. Returns the squared distance at
+// the final u.
 double NewtonStep(const Curve& c, const D& q, double& u) noexcept {
-  D b, d1, d2;
-  c.Eval(u, b, d1, d2);
-  const D diff = b - q;
-  const double here = diff.SquaredLength();
-  const double f = Dot(diff, d1);
-  const double fp = Dot(d1, d1) + Dot(diff, d2);
-  if (!(fp > 0.0) || f == 0.0) return here;
-  double next = u - f / fp;
-  if (!(next >= 0.0)) next = 0.0;  // also catches NaN
-  if (next > 1.0) next = 1.0;
-  if (next == u) return here;
-  const double there = (c.Point(next) - q).SquaredLength();
-  if (there < here) {
-    u = next;
-    return there;
-  }
-  return here;
+  return CubicBezier::internal::PolishNearest(c.p, V(q), u, 0.0, 1.0, 1);
 }
 
 // Schneider's solve: the handle lengths that minimise the sum of squares for
@@ -337,19 +316,13 @@ double FitCubic(const V* points, double* parameters, int count, const D& startTa
   // Measure the returned curve at parameters refined on it.
   error = 0.0;
   for (int i = 0; i < m; ++i) {
-    double d = 0.0;
-    for (int k = 0; k < kPolishSteps; ++k) {
-      const double was = s[i].best;
-      d = NewtonStep(best, s[i].q, s[i].best);
-      if (k > 0 && s[i].best == was) break;
-    }
-    error = std::max(error, d);
+    error = std::max(error, CubicBezier::internal::PolishNearest(best.p, V(s[i].q), s[i].best, 0.0, 1.0, kPolishSteps));
   }
-  if (!std::isfinite(error) || !best.p1.IsFinite() || !best.p2.IsFinite()) return kLeastSquaresNoFit;
+  if (!std::isfinite(error) || !best.p[1].IsFinite() || !best.p[2].IsFinite()) return kLeastSquaresNoFit;
 
   bezierOut[0] = points[0];
-  bezierOut[1] = origin + best.p1;
-  bezierOut[2] = origin + best.p2;
+  bezierOut[1] = origin + D(best.p[1]);
+  bezierOut[2] = origin + D(best.p[2]);
   bezierOut[3] = points[count - 1];
   if (parameters) {
     parameters[0] = 0.0;

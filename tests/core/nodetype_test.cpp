@@ -22,6 +22,12 @@ constexpr NODETYPE kMove = 0x04, kLine = 0x44, kCurve = 0x84, kArc = 0xC0, kCMov
 // The closed triangle: four points, the last equal to the first.
 const Nodes kTriangle = {0x0C, 0x44, 0x44, 0x48};
 
+TEST(NodeTypeConstants, HaveThePublishedBytes) {
+  EXPECT_EQ((Nodes{NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::curve, NodeTypes::arc,
+                   NodeTypes::Closed::move, NodeTypes::Closed::line, NodeTypes::Closed::curve, NodeTypes::Open::symmCurve}),
+            (Nodes{kMove, kLine, kCurve, kArc, kCMove, kCLine, kCCurve, 0xA4}));
+}
+
 TEST(NodeValidity, AcceptsLegalShapes) {
   EXPECT_TRUE(IsValidCurve(nullptr, 0));
   EXPECT_TRUE(valid({kMove}));

@@ -1,6 +1,7 @@
 // Independent geometry of raw paths for tests: Bezier points straight from
 // the Bernstein polynomials, fine flattenings, shoelace areas and lengths,
-// and points for the random node arrays of random_paths.h. Nothing here calls
+// radial errors against an ellipse, and points for the random node arrays of
+// random_paths.h. Nothing here calls
 // the library's geometry, so that tests compare against a second method.
 #pragma once
 
@@ -22,11 +23,25 @@ using MavikMath::V;
 inline V Widen(const Framework::common_types::POINT& p) { return V{double(p.x), double(p.y)}; }
 inline V Widen(const V& p) { return p; }
 
+// A curve's node bytes, and whether they form a legal path.
+template <class C>
+std::vector<NODETYPE> NodesOf(const C& c) {
+  return {c.GetNodeTypes(), c.GetNodeTypes() + c.GetPointCount()};
+}
+template <class C>
+bool Valid(const C& c) {
+  return OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount());
+}
+
 // The cubic through p0..p3 at t from its Bernstein form.
 inline V Bezier(const V& p0, const V& p1, const V& p2, const V& p3, double t) {
   const double s = 1.0 - t;
   const double b0 = s * s * s, b1 = 3 * s * s * t, b2 = 3 * s * t * t, b3 = t * t * t;
   return V{b0 * p0.x + b1 * p1.x + b2 * p2.x + b3 * p3.x, b0 * p0.y + b1 * p1.y + b2 * p2.y + b3 * p3.y};
+}
+template <class T>
+V Bezier(const T* p, double t) {
+  return Bezier(Widen(p[0]), Widen(p[1]), Widen(p[2]), Widen(p[3]), t);
 }
 
 // One polyline per subpath; each Bezier contributes `steps` chords.
@@ -76,14 +91,6 @@ double Length(const T* pts, const NODETYPE* nds, int n) {
   return l;
 }
 
-// All flattened points of a path, subpath borders ignored.
-template <class T>
-std::vector<V> Samples(const T* pts, const NODETYPE* nds, int n, int steps = 64) {
-  std::vector<V> all;
-  for (const auto& poly : Flatten(pts, nds, n, steps)) all.insert(all.end(), poly.begin(), poly.end());
-  return all;
-}
-
 // Distance from q to the nearest chord of a flattening.
 inline double DistanceToPolylines(const std::vector<std::vector<V>>& polys, const V& q) {
   double best = std::numeric_limits<double>::infinity();
@@ -128,6 +135,22 @@ V PointAt(const T* p, const NODETYPE* n, int s, double t) {
     return V{a.x + t * (b.x - a.x), a.y + t * (b.y - a.y)};
   }
   return Bezier(Widen(p[s]), Widen(p[s + 1]), Widen(p[s + 2]), Widen(p[s + 3]), t);
+}
+
+// Largest radial error of the standard quarter-circle Bezier, over the radius.
+constexpr double kQuarterError = 2.75e-4;
+
+// Largest radial error, on the unit circle the ellipse round c is mapped from,
+// of the samples of a path (a pie's centre skipped).
+template <class T>
+double MaxUnitRadialError(const T* p, const NODETYPE* nd, int n, V c, double rx, double ry) {
+  double worst = 0.0;
+  for (const auto& poly : Flatten(p, nd, n, 64))
+    for (const V& q : poly) {
+      const double r = std::hypot((q.x - c.x) / rx, (q.y - c.y) / ry);
+      if (r > 1e-9) worst = std::max(worst, std::fabs(r - 1.0));
+    }
+  return worst;
 }
 
 // Random points for the node array of a random path; each closed subpath

@@ -285,8 +285,8 @@ TEST(EngineCases, SelfCrossingCubicGivesItsLoop) {
   EXPECT_EQ(list[0]->other, list[1]);
   EXPECT_LT(list[0]->t, list[1]->t);
   const V pts[4] = {{0, 0}, {200, 100}, {-100, 100}, {100, 0}};
-  EXPECT_LT(Dist2(BezierAt(pts, list[0]->t), list[0]->point), 1e-16);
-  EXPECT_LT(Dist2(BezierAt(pts, list[1]->t), list[1]->point), 1e-16);
+  EXPECT_LT(SquaredDistance(Bezier(pts, list[0]->t), list[0]->point), 1e-16);
+  EXPECT_LT(SquaredDistance(Bezier(pts, list[1]->t), list[1]->point), 1e-16);
   EXPECT_NEAR(list[0]->point.x, 50, 1e-9);  // symmetric about x = 50
   EXPECT_EQ(s.curves[0].intersectsWith, std::vector<int>{0});
   // Not self-tested: no loop. A loop closing near an end: ignored.

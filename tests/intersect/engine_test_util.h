@@ -1,21 +1,19 @@
 // Helpers of the intersection engine tests: building raw paths, running the
 // engine, snapshots of its records for exact comparison, an invariant check
-// with an independent curve evaluation, and a small reader of SVG path data
-// (absolute M, L, C, Z) for the real shapes of the corpus.
+// with an independent curve evaluation, and the real shapes of the corpus.
 #pragma once
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cctype>
 #include <cmath>
-#include <cstdio>
 #include <fstream>
-#include <sstream>
 #include <string>
 #include <vector>
 
+#include "core/path_geometry.h"
 #include "ostracrv/intersect/segments.h"
+#include "ostracrv/io/svg_path.h"
 
 namespace engine_test {
 
@@ -71,14 +69,9 @@ struct Path {
 
 inline POINT P(int x, int y) { return POINT{x, y}; }
 
-// Independent evaluation: Bernstein form.
-inline V BezierAt(const V* p, double t) {
-  const double s = 1.0 - t;
-  const double b0 = s * s * s, b1 = 3 * s * s * t, b2 = 3 * s * t * t, b3 = t * t * t;
-  return V{b0 * p[0].x + b1 * p[1].x + b2 * p[2].x + b3 * p[3].x,
-           b0 * p[0].y + b1 * p[1].y + b2 * p[2].y + b3 * p[3].y};
-}
-inline double Dist2(const V& a, const V& b) { return (a.x - b.x) * (a.x - b.x) + (a.y - b.y) * (a.y - b.y); }
+// Independent evaluation: the Bernstein form of path_geometry.h.
+using testgeo::Bezier;
+using MavikMath::SquaredDistance;
 
 // The segment's points as doubles.
 template <class T>
@@ -94,7 +87,7 @@ template <class T>
 V SegmentAt(const SegmentsT<T>& s, int segment, double t) {
   const std::vector<V> p = SegmentPointsOf(s, segment);
   if (p.size() == 2) return V{p[0].x + (p[1].x - p[0].x) * t, p[0].y + (p[1].y - p[0].y) * t};
-  return BezierAt(p.data(), t);
+  return Bezier(p.data(), t);
 }
 
 // One record, with its links as list positions, for exact comparison.
@@ -166,7 +159,7 @@ void CheckInvariants(const SegmentsT<T>& s, double maxDistance) {
       if (k > 0) {
         EXPECT_LE(list[k - 1]->t, r->t);
       }
-      const double d = std::sqrt(Dist2(SegmentAt(s, static_cast<int>(si), r->t), r->point));
+      const double d = std::sqrt(SquaredDistance(SegmentAt(s, static_cast<int>(si), r->t), r->point));
       EXPECT_LE(d, maxDistance) << "segment " << si << " t " << r->t;
       if (r->overlapEnd) {
         ++withOverlapEnd;
@@ -202,62 +195,22 @@ inline SegmentIntersectionSettings Settings(double end, double touch) {
   return s;
 }
 
-// SVG path data with absolute M, L, C and Z (and implicit lines after M).
-// A subpath that returns to its start without Z is closed as well.
-inline Path<V> ParseSvgPath(const std::string& data) {
-  Path<V> path;
-  std::string text = data;
-  for (char& c : text)
-    if (c == ',') c = ' ';
-  std::istringstream in(text);
-  char command = 0;
-  auto number = [&](double& v) -> bool {
-    in >> std::ws;
-    const int c = in.peek();
-    if (c == EOF || std::isalpha(c)) return false;
-    return static_cast<bool>(in >> v);
-  };
-  auto finish = [&] {
-    if (path.subpathStart >= 0 && path.size() - path.subpathStart > 1 &&
-        path.points.back() == path.points[path.subpathStart] && (path.nodes[path.subpathStart] & 0x08) == 0)
-      path.Close();
-  };
-  while (in >> std::ws, in.peek() != EOF) {
-    if (std::isalpha(in.peek())) in >> command;
-    if (command == 'Z' || command == 'z') {
-      if (path.subpathStart >= 0 && (path.nodes[path.subpathStart] & 0x08) == 0) path.Close();
-      command = 0;
-      continue;
-    }
-    double v[6];
-    if (command == 'M') {
-      if (!number(v[0]) || !number(v[1])) break;
-      finish();
-      path.Move(V{v[0], v[1]});
-      command = 'L';
-    } else if (command == 'L') {
-      if (!number(v[0]) || !number(v[1])) break;
-      path.Line(V{v[0], v[1]});
-    } else if (command == 'C') {
-      for (double& x : v)
-        if (!number(x)) return path;
-      path.Cubic(V{v[0], v[1]}, V{v[2], v[3]}, V{v[4], v[5]});
-    } else {
-      break;
-    }
-  }
-  finish();
-  return path;
-}
-
-// The two operands of a corpus file (two lines of path data), or none if
+// The two operands of a corpus file (two lines of SVG path data), or none if
 // the file is missing.
 inline std::vector<Path<V>> ReadCorpusPair(const std::string& file) {
   std::ifstream in(file);
   std::vector<Path<V>> out;
   std::string line;
-  while (std::getline(in, line))
-    if (!line.empty()) out.push_back(ParseSvgPath(line));
+  while (std::getline(in, line)) {
+    OstraCrv::PolycurveT<V> curve;
+    if (line.empty() || !OstraCrv::ParseSvgPathData(line, curve)) continue;
+    Path<V> p;
+    const V* pts = curve.GetPoints();
+    const NODETYPE* nodes = curve.GetNodeTypes();
+    p.points.assign(pts, pts + curve.GetPointCount());
+    p.nodes.assign(nodes, nodes + curve.GetPointCount());
+    out.push_back(p);
+  }
   return out;
 }
 

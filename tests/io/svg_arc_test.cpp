@@ -11,6 +11,7 @@
 #include <random>
 #include <vector>
 
+#include "core/path_geometry.h"
 #include "polycurve.h"
 
 namespace {
@@ -67,12 +68,6 @@ void ToUnit(const Ellipse& e, V p, double& radius, double& angle) {
   angle = std::atan2(y, x);
 }
 
-V CubicAt(const V* p, double t) {
-  const double s = 1 - t;
-  return {s * s * s * p[0].x + 3 * s * s * t * p[1].x + 3 * s * t * t * p[2].x + t * t * t * p[3].x,
-          s * s * s * p[0].y + 3 * s * s * t * p[1].y + 3 * s * t * t * p[2].y + t * t * t * p[3].y};
-}
-
 // The angle a relative to the arc's start, unwrapped into the sweep's sign.
 double Progress(const Ellipse& e, double a) {
   double d = a - e.theta1;
@@ -109,7 +104,7 @@ double CheckArc(V from, double rx, double ry, double phiDeg, bool fa, bool fs, V
     EXPECT_LE(span, kPi / 2 + 1e-9) << "piece " << k;
     for (int s = 0; s <= 64; ++s) {
       double radius, angle;
-      ToUnit(e, CubicAt(p, s / 64.0), radius, angle);
+      ToUnit(e, testgeo::Bezier(p, s / 64.0), radius, angle);
       worst = std::max(worst, std::fabs(radius - 1));
       const double prog = Progress(e, angle);
       // Monotone along the sweep, within the arc.

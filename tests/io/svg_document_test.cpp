@@ -9,6 +9,7 @@
 #include <cmath>
 #include <string>
 
+#include "core/path_geometry.h"
 #include "polycurve.h"
 #include "svg_document.h"
 
@@ -123,10 +124,8 @@ void ExpectOnEllipse(const PolycurveD& c, double cx, double cy, double rx, doubl
     if (!IsCurve(c.GetNodeType(i))) continue;
     const V* p = c.GetPoints() + i - 3;
     for (int s = 0; s <= 20; ++s) {
-      const double t = s / 20.0, u = 1 - t;
-      const double x = u * u * u * p[0].x + 3 * u * u * t * p[1].x + 3 * u * t * t * p[2].x + t * t * t * p[3].x;
-      const double y = u * u * u * p[0].y + 3 * u * u * t * p[1].y + 3 * u * t * t * p[2].y + t * t * t * p[3].y;
-      EXPECT_NEAR(std::hypot((x - cx) / rx, (y - cy) / ry), 1.0, 2.8e-4);
+      const V q = testgeo::Bezier(p, s / 20.0);
+      EXPECT_NEAR(std::hypot((q.x - cx) / rx, (q.y - cy) / ry), 1.0, 2.8e-4);
     }
   }
 }

@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "core/path_geometry.h"
 #include "polycurve.h"
 
 namespace {
@@ -116,15 +117,10 @@ TEST(SvgPathGrammar, SmoothCubicReflectsOnlyAfterACubic) {
   EXPECT_EQ(c.GetPoint(4), (V{6, 0}));
 }
 
-// Points of a quadratic and of a cubic at t.
+// The point of a quadratic at t.
 V Quad(V a, V b, V c, double t) {
   const double s = 1 - t;
   return {s * s * a.x + 2 * s * t * b.x + t * t * c.x, s * s * a.y + 2 * s * t * b.y + t * t * c.y};
-}
-V Cubic(const V* p, double t) {
-  const double s = 1 - t;
-  return {s * s * s * p[0].x + 3 * s * s * t * p[1].x + 3 * s * t * t * p[2].x + t * t * t * p[3].x,
-          s * s * s * p[0].y + 3 * s * s * t * p[1].y + 3 * s * t * t * p[2].y + t * t * t * p[3].y};
 }
 
 TEST(SvgPathGrammar, QuadraticsBecomeTheSameCurveAsCubics) {
@@ -141,7 +137,7 @@ TEST(SvgPathGrammar, QuadraticsBecomeTheSameCurveAsCubics) {
   for (int k = 0; k < 4; ++k) {
     for (int s = 0; s <= 16; ++s) {
       const double t = s / 16.0;
-      const V a = Quad(quads[k][0], quads[k][1], quads[k][2], t), b = Cubic(p + starts[k], t);
+      const V a = Quad(quads[k][0], quads[k][1], quads[k][2], t), b = testgeo::Bezier(p + starts[k], t);
       EXPECT_NEAR(a.x, b.x, 1e-12) << k << " " << t;
       EXPECT_NEAR(a.y, b.y, 1e-12) << k << " " << t;
     }

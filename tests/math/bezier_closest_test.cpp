@@ -1,54 +1,38 @@
+#include "ostracrv/math/bezier_closest.h"
+
 #include <gtest/gtest.h>
 
-#include <cmath>
-#include <limits>
-#include <random>
-#include <vector>
-
-#include "math/search_reference.h"
-#include "ostracrv/math/bezier_closest.h"
+#include "math/test_curves.h"
 
 namespace {
 
-using Framework::common_types::POINT;
-using MavikMath::V;
+using namespace testcurves;
 using namespace MavikMath::CubicBezier;
-using search_ref::At;
-using search_ref::Curve;
-using search_ref::Dist2;
-
-constexpr double kMax = std::numeric_limits<double>::max();
+using MavikMath::SquaredDistance;
 
 // The global minimum against dense sampling with golden-section refinement,
-// on random curves (many with loops), cusps and loops built to order.
+// on random curves (many with loops), cusps and loops built to order; the
+// same far from the origin, to the precision left there.
 TEST(BezierClosest, GlobalMinimumMatchesDenseReference) {
   std::mt19937 rng(7);
   std::uniform_real_distribution<double> u(-50.0, 150.0), s(0.05, 0.95);
   for (int i = 0; i < 3000; ++i) {
-    Curve c;
-    if (i % 3 == 0) c = search_ref::RandomCurve(rng);
-    else if (i % 3 == 1) c = search_ref::RandomCusp(rng, s(rng));
-    else {
-      const double a = s(rng), b = s(rng);
-      c = search_ref::LoopThrough(rng, std::min(a, b), std::max(a, b));
-    }
+    const double a = s(rng), b = s(rng);
+    const Curve c = i % 3 == 0 ? RandomCurve(rng)
+                               : i % 3 == 1 ? RandomCusp(rng, a) : LoopThrough(rng, std::min(a, b), std::max(a, b));
     const V target{u(rng), u(rng)};
-    double t = -1, d = kMax;
+    double t = -1, d = kMaxDouble;
     V p;
     ASSERT_TRUE(FindClosestPointOnBezier(c.data(), target, t, p, d)) << i;
-    const double ref = search_ref::ClosestRef(c, target);
-    ASSERT_GE(t, 0.0);
-    ASSERT_LE(t, 1.0);
-    // The answer is a point of the curve at t, and no farther than the reference.
-    EXPECT_NEAR(d, Dist2(At(c, t), target), 1e-9 * (1 + d)) << i;
-    EXPECT_LE(d, ref + 1e-10 * (1 + ref)) << i;
-    EXPECT_LT(Dist2(p, At(c, t)), 1e-18 * 1e4) << i;
-    // The same far from the origin, to the precision left there.
+    const double ref = NearestSq(c.data(), target);
+    ASSERT_TRUE(t >= 0.0 && t <= 1.0);
+    EXPECT_NEAR(d, SquaredDistance(At(c, t), target), 1e-9 * (1 + d)) << i;  // a point of the curve at t
+    EXPECT_LE(d, ref + 1e-10 * (1 + ref)) << i;                              // no farther than the reference
+    EXPECT_LT(SquaredDistance(p, At(c, t)), 1e-14) << i;
     Curve f = c;
     for (auto& q : f) q = V{q.x - 4e6, q.y + 9e6};
-    double tf = 0, df = kMax;
-    V pf;
-    ASSERT_TRUE(FindClosestPointOnBezier(f.data(), V{target.x - 4e6, target.y + 9e6}, tf, pf, df));
+    double tf = 0, df = kMaxDouble;
+    ASSERT_TRUE(FindClosestPointOnBezier(f.data(), V{target.x - 4e6, target.y + 9e6}, tf, p, df));
     EXPECT_NEAR(std::sqrt(df), std::sqrt(d), 1e-7) << i;
   }
 }
@@ -57,17 +41,13 @@ TEST(BezierClosest, GlobalMinimumMatchesDenseReference) {
 TEST(BezierClosest, FindsCrossingAndCuspPoints) {
   std::mt19937 rng(11);
   for (int i = 0; i < 200; ++i) {
-    const Curve loop = search_ref::LoopThrough(rng, 0.2, 0.7);
-    const V x = At(loop, 0.2);
-    double t = 0, d = kMax;
-    V p;
-    ASSERT_TRUE(FindClosestPointOnBezier(loop.data(), x, t, p, d));
-    EXPECT_LT(d, 1e-16 * (1 + x.SquaredLength()));
-    const Curve cusp = search_ref::RandomCusp(rng, 0.4);
-    const V k = At(cusp, 0.4);
-    d = kMax;
-    ASSERT_TRUE(FindClosestPointOnBezier(cusp.data(), k, t, p, d));
-    EXPECT_LT(d, 1e-16 * (1 + k.SquaredLength()));
+    const Curve loop = LoopThrough(rng, 0.2, 0.7), cusp = RandomCusp(rng, 0.4);
+    for (const auto& [c, x] : {std::pair{loop, At(loop, 0.2)}, std::pair{cusp, At(cusp, 0.4)}}) {
+      double t = 0, d = kMaxDouble;
+      V p;
+      ASSERT_TRUE(FindClosestPointOnBezier(c.data(), x, t, p, d));
+      EXPECT_LT(d, 1e-16 * (1 + x.SquaredLength()));
+    }
   }
 }
 
@@ -79,9 +59,7 @@ TEST(BezierClosest, EnteringDistanceIsBestSoFar) {
   double t = -5, d = 99.0;  // better than the curve's 100
   V p{-1, -1};
   EXPECT_FALSE(FindClosestPointOnBezier(c, target, t, p, d));
-  EXPECT_EQ(t, -5);
-  EXPECT_EQ(d, 99.0);
-  EXPECT_EQ(p, (V{-1, -1}));
+  EXPECT_TRUE(t == -5 && d == 99.0 && p == (V{-1, -1}));
   d = 100.0;  // equal is not closer
   EXPECT_FALSE(FindClosestPointOnBezier(c, target, t, p, d));
   d = 100.5;
@@ -102,78 +80,59 @@ TEST(BezierClosest, IntegerFormRoundsThePoint) {
   for (int i = 0; i < 500; ++i) {
     POINT c[4];
     V cv[4];
-    for (int k = 0; k < 4; ++k) {
-      c[k] = POINT{u(rng), u(rng)};
-      cv[k] = V{double(c[k].x), double(c[k].y)};
-    }
+    RandomIntegerCurve(rng, 500, c, cv);
     const POINT target{u(rng), u(rng)};
-    double ti = 0, di = kMax, tv = 0, dv = kMax;
+    double ti = 0, di = kMaxDouble, tv = 0, dv = kMaxDouble;
     POINT pi;
     V pv;
     const bool okI = FindClosestPointOnBezier(c, target, ti, pi, di);
-    const bool okV = FindClosestPointOnBezier(cv, V{double(target.x), double(target.y)}, tv, pv, dv);
-    ASSERT_EQ(okI, okV);
+    ASSERT_EQ(okI, FindClosestPointOnBezier(cv, V{double(target.x), double(target.y)}, tv, pv, dv));
     if (!okI) continue;
-    EXPECT_EQ(ti, tv);
-    EXPECT_EQ(di, dv);
+    EXPECT_TRUE(ti == tv && di == dv);
     EXPECT_EQ(pi, (POINT{MavikMath::RoundToInt(pv.x), MavikMath::RoundToInt(pv.y)}));
   }
-  // Half away from zero on a straight curve from -3 to 3 at y = -2.5.
+  // Half away from zero: the lowest point (0, -2.75) of a curve from -3 to 3.
   const POINT line[4] = {POINT{-3, -2}, POINT{-1, -3}, POINT{1, -3}, POINT{3, -2}};
-  double t = 0, d = kMax;
+  double t = 0, d = kMaxDouble;
   POINT p;
   ASSERT_TRUE(FindClosestPointOnBezier(line, POINT{0, -10}, t, p, d));
-  EXPECT_EQ(p, (POINT{0, -3}));  // the curve's lowest point is (0, -2.75): rounds to -3
+  EXPECT_EQ(p, (POINT{0, -3}));
 }
 
-// Every local minimum of the distance, checked against the sampled
-// minima; every reported minimum is a true local minimum.
+// Every local minimum of the distance, checked against the sampled minima
+// with a clear dip; every reported minimum is a true local minimum and the
+// smallest is the global one.
 TEST(BezierClosest, AllLocalMinima) {
   std::mt19937 rng(3);
   std::uniform_real_distribution<double> u(-20.0, 120.0);
   int checked = 0;
   for (int i = 0; i < 800; ++i) {
-    const Curve c = i % 2 ? search_ref::RandomCurve(rng) : search_ref::LoopThrough(rng, 0.3, 0.6);
+    const Curve c = i % 2 ? RandomCurve(rng) : LoopThrough(rng, 0.3, 0.6);
     const V target{u(rng), u(rng)};
     std::vector<double> ts, ds;
     std::vector<V> ps;
     ASSERT_TRUE(FindClosestPointsOnBezier(c.data(), target, ts, ps, ds));
-    ASSERT_EQ(ts.size(), ps.size());
-    ASSERT_EQ(ts.size(), ds.size());
-    ASSERT_LE(ts.size(), 4u);
+    ASSERT_TRUE(ts.size() == ps.size() && ts.size() == ds.size() && ts.size() <= 4u);
     for (size_t k = 0; k < ts.size(); ++k) {
-      if (k) {
-        EXPECT_LT(ts[k - 1], ts[k]);
-      }
-      EXPECT_NEAR(ds[k], Dist2(At(c, ts[k]), target), 1e-9 * (1 + ds[k]));
-      const double h = 1e-4;
-      if (ts[k] - h >= 0) {
-        EXPECT_LE(ds[k], Dist2(At(c, ts[k] - h), target) + 1e-9) << i;
-      }
-      if (ts[k] + h <= 1) {
-        EXPECT_LE(ds[k], Dist2(At(c, ts[k] + h), target) + 1e-9) << i;
-      }
+      EXPECT_TRUE(k == 0 || ts[k - 1] < ts[k]);
+      EXPECT_NEAR(ds[k], SquaredDistance(At(c, ts[k]), target), 1e-9 * (1 + ds[k]));
+      for (double h : {-1e-4, 1e-4})
+        EXPECT_TRUE(ts[k] + h < 0 || ts[k] + h > 1 || ds[k] <= SquaredDistance(At(c, ts[k] + h), target) + 1e-9) << i;
     }
-    // Sampled minima with a clear dip (relative prominence) must be found.
-    const int n = 2000;
+    const int n = 2000, w = n / 20;
     std::vector<double> d(n + 1);
-    for (int k = 0; k <= n; ++k) d[k] = Dist2(At(c, double(k) / n), target);
+    for (int k = 0; k <= n; ++k) d[k] = SquaredDistance(At(c, double(k) / n), target);
     for (int k = 0; k <= n; ++k) {
-      const bool isMin = (k == 0 || d[k] < d[k - 1]) && (k == n || d[k] < d[k + 1]);
-      if (!isMin) continue;
+      if ((k > 0 && d[k] >= d[k - 1]) || (k < n && d[k] >= d[k + 1])) continue;
       // Prominence: rises by 1e-3 relative within 0.05 on both open sides.
-      const int w = n / 20;
       const double lim = d[k] + 1e-3 * (1 + d[k]);
-      const bool leftRise = k == 0 || d[std::max(0, k - w)] > lim;
-      const bool rightRise = k == n || d[std::min(n, k + w)] > lim;
-      if (!leftRise || !rightRise) continue;
+      if ((k > 0 && d[std::max(0, k - w)] <= lim) || (k < n && d[std::min(n, k + w)] <= lim)) continue;
       ++checked;
       bool found = false;
-      for (size_t j = 0; j < ts.size(); ++j) found = found || std::fabs(ts[j] - double(k) / n) <= 1.0 / n + 1e-9;
+      for (double t : ts) found = found || std::fabs(t - double(k) / n) <= 1.0 / n + 1e-9;
       EXPECT_TRUE(found) << "curve " << i << " minimum near t=" << double(k) / n;
     }
-    // The smallest reported minimum is the global one.
-    double t = 0, dmin = kMax;
+    double t = 0, dmin = kMaxDouble;
     V p;
     ASSERT_TRUE(FindClosestPointOnBezier(c.data(), target, t, p, dmin));
     EXPECT_NEAR(*std::min_element(ds.begin(), ds.end()), dmin, 1e-9 * (1 + dmin));
@@ -184,48 +143,36 @@ TEST(BezierClosest, AllLocalMinima) {
 // A target at the centre of a near-circular arc: several minima of almost
 // equal distance; the ends count only when the distance grows from them.
 TEST(BezierClosest, CentreOfArcAndEndMinima) {
-  const double k = 0.5522847498;
-  const V arc[4] = {V{100, 0}, V{100, 100 * k}, V{100 * k, 100}, V{0, 100}};
+  const Curve arc = QuarterArc(100);
   std::vector<double> ts, ds;
   std::vector<V> ps;
-  ASSERT_TRUE(FindClosestPointsOnBezier(arc, V{0, 0}, ts, ps, ds));
+  ASSERT_TRUE(FindClosestPointsOnBezier(arc.data(), V{0, 0}, ts, ps, ds));
   for (double d : ds) EXPECT_NEAR(std::sqrt(d), 100.0, 0.03);
-  // A target beyond the start: only the start is a minimum.
-  ts.clear();
-  ps.clear();
-  ds.clear();
-  ASSERT_TRUE(FindClosestPointsOnBezier(arc, V{110, -50}, ts, ps, ds));
+  ts.clear(), ps.clear(), ds.clear();
+  ASSERT_TRUE(FindClosestPointsOnBezier(arc.data(), V{110, -50}, ts, ps, ds));  // beyond the start
   ASSERT_EQ(ts.size(), 1u);
   EXPECT_EQ(ts[0], 0.0);
   EXPECT_EQ(ps[0], arc[0]);
 }
 
-// Null, non-finite and point-like curves: false, outputs untouched.
+// Null, non-finite and point-like curves, non-finite targets: false,
+// outputs untouched.
 TEST(BezierClosest, BadInputLeavesOutputs) {
-  const double nan = std::nan(""), inf = std::numeric_limits<double>::infinity();
   const V good[4] = {V{0, 0}, V{1, 1}, V{2, 1}, V{3, 0}};
-  const V bad1[4] = {V{0, 0}, V{nan, 1}, V{2, 1}, V{3, 0}};
-  const V bad2[4] = {V{0, 0}, V{1, 1}, V{2, inf}, V{3, 0}};
-  const V dot[4] = {V{5, 5}, V{5, 5}, V{5, 5}, V{5, 5}};
-  for (const V* c : {static_cast<const V*>(nullptr), bad1, bad2, dot}) {
-    double t = 0.25, d = kMax;
+  auto expectNothing = [](const V* c, const V& target) {
+    double t = 0.25, d = kMaxDouble;
     V p{7, 7};
-    EXPECT_FALSE(FindClosestPointOnBezier(c, V{1, 0}, t, p, d));
-    EXPECT_EQ(t, 0.25);
-    EXPECT_EQ(d, kMax);
-    EXPECT_EQ(p, (V{7, 7}));
+    EXPECT_FALSE(FindClosestPointOnBezier(c, target, t, p, d));
+    EXPECT_TRUE(t == 0.25 && d == kMaxDouble && p == (V{7, 7}));
     std::vector<double> ts{9}, ds{9};
     std::vector<V> ps{V{9, 9}};
-    EXPECT_FALSE(FindClosestPointsOnBezier(c, V{1, 0}, ts, ps, ds));
-    EXPECT_EQ(ts.size(), 1u);
-    EXPECT_EQ(ps.size(), 1u);
-    EXPECT_EQ(ds.size(), 1u);
-  }
-  double t = 0.25, d = kMax;
-  V p;
-  EXPECT_FALSE(FindClosestPointOnBezier(good, V{nan, 0}, t, p, d));
-  EXPECT_FALSE(FindClosestPointOnBezier(good, V{0, inf}, t, p, d));
-  EXPECT_EQ(t, 0.25);
+    EXPECT_FALSE(FindClosestPointsOnBezier(c, target, ts, ps, ds));
+    EXPECT_TRUE(ts.size() == 1u && ps.size() == 1u && ds.size() == 1u);
+  };
+  for (const Curve& c : kBadCurves) expectNothing(c.data(), V{1, 0});
+  expectNothing(nullptr, V{1, 0});
+  expectNothing(good, V{kNaN, 0});
+  expectNothing(good, V{0, kInf});
 }
 
 }  // namespace

@@ -2,30 +2,19 @@
 
 #include <gtest/gtest.h>
 
-#include <array>
-#include <cmath>
-#include <limits>
-#include <random>
-#include <vector>
-
-#include "math/fit_reference.h"
+#include "math/test_curves.h"
 #include "ostracrv/math/bezier_split.h"
 
+using namespace testcurves;
 using namespace MavikMath;
 using Bez = CubicBezier::bezier2dT<V>;
 
 namespace {
 
 // The offset as defined: B(t) + d n(t), n the unit left normal of B'.
-V TrueOffset(const V* p, double d, double t) {
-  const D n = fitref::Deriv(p, t).Normalized().Perpendicular();
-  return fitref::Point(p, t) + n * d;
-}
+V TrueOffset(const V* p, double d, double t) { return At(p, t) + Velocity(p, t).Normalized().Perpendicular() * d; }
 
-Bez RandomCubic(std::mt19937& rng, double size) {
-  std::uniform_real_distribution<double> u(-size, size);
-  return Bez{{{u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}, {u(rng), u(rng)}}};
-}
+Bez ToBez(const V* c) { return Bez{{c[0], c[1], c[2], c[3]}}; }
 
 // The callers' recursion: split where the library says, until it accepts.
 struct Accepted {
@@ -35,7 +24,7 @@ int OffsetRecursively(const Bez& b, double d, double tol, int depth, std::vector
   V r[4];
   double s = -1.0;
   if (FindBezierOffsetCurve(b.data(), r, d, tol * tol, s)) {
-    out.push_back({b, Bez{{r[0], r[1], r[2], r[3]}}});
+    out.push_back({b, ToBez(r)});
     return depth;
   }
   if (!(s > 0.0 && s < 1.0) || depth > 40) return 1000;  // gave up: not expected here
@@ -48,8 +37,7 @@ int OffsetRecursively(const Bez& b, double d, double tol, int depth, std::vector
 double WorstDeviationSq(const Accepted& a, double d, int n = 300) {
   double worst = 0;
   for (int i = 0; i <= n; ++i)
-    worst = std::max(worst, fitref::DistanceSq([&](double t) { return fitref::Point(a.result.data(), t); },
-                                               TrueOffset(a.source.data(), d, double(i) / n), n + 100));
+    worst = std::max(worst, NearestSq(a.result.data(), TrueOffset(a.source.data(), d, double(i) / n), nullptr, n + 100));
   return worst;
 }
 
@@ -66,7 +54,7 @@ TEST(FindBezierOffsetCurve, AcceptedCurvesStayWithinToleranceOfTheTrueOffset) {
   std::uniform_real_distribution<double> u(0, 1);
   int accepted = 0;
   for (int trial = 0; trial < 120; ++trial) {
-    const Bez b = RandomCubic(rng, 100);
+    const Bez b = ToBez(RandomCurve(rng, -100, 100).data());
     const double d = (2 * u(rng) - 1) * 60, tol = 0.01 + 2 * u(rng);
     std::vector<Bez> pieces;
     GetSegmentsToOffset(b, pieces, d, nullptr);
@@ -77,7 +65,7 @@ TEST(FindBezierOffsetCurve, AcceptedCurvesStayWithinToleranceOfTheTrueOffset) {
       for (const Accepted& a : out) {
         ++accepted;
         ASSERT_LT(WorstDeviationSq(a, d), tol * tol) << "trial " << trial;
-        // Ends are the exact offsets of the ends; end tangents parallel.
+        // Ends are the exact offsets of the ends.
         EXPECT_LT(Distance(a.result[0], TrueOffset(a.source.data(), d, 0)), 1e-9 * (100 + std::fabs(d)));
         EXPECT_LT(Distance(a.result[3], TrueOffset(a.source.data(), d, 1)), 1e-9 * (100 + std::fabs(d)));
       }
@@ -108,17 +96,16 @@ TEST(FindBezierOffsetCurve, SignConventionAndConcentricArcs) {
   // A counter-clockwise quarter circle of radius 100 around the origin: the
   // offset of d lies on the circle of radius 100 - d, and beyond the centre
   // (d = 150) it runs backwards on radius 50.
-  const double k = 0.5522847498 * 100;
-  const V arc[4] = {{100, 0}, {100, k}, {k, 100}, {0, 100}};
+  const Curve arc = QuarterArc(100);
   for (double d : {30.0, -30.0, 150.0}) {
     s = -1.0;
-    ASSERT_TRUE(FindBezierOffsetCurve(arc, r, d, 0.25, s)) << d;
-    for (int i = 0; i <= 50; ++i) EXPECT_NEAR(fitref::Point(r, i / 50.0).Length(), std::fabs(100 - d), 0.5 + 0.03);
+    ASSERT_TRUE(FindBezierOffsetCurve(arc.data(), r, d, 0.25, s)) << d;
+    for (int i = 0; i <= 50; ++i) EXPECT_NEAR(At(r, i / 50.0).Length(), std::fabs(100 - d), 0.5 + 0.03);
     // Beyond the centre the offset runs against the curve.
     EXPECT_EQ(Dot(r[1] - r[0], arc[1] - arc[0]) > 0, d < 100) << d;
   }
   // Distance 0 is the curve itself.
-  ASSERT_TRUE(FindBezierOffsetCurve(arc, r, 0.0, 1e-6, s));
+  ASSERT_TRUE(FindBezierOffsetCurve(arc.data(), r, 0.0, 1e-6, s));
   for (int i = 0; i < 4; ++i) EXPECT_EQ(r[i], arc[i]);
 }
 
@@ -129,12 +116,12 @@ TEST(GetSegmentsToOffset, CutsAtInflectionsAndWhereTheRadiusEqualsTheDistance) {
   std::uniform_real_distribution<double> u(0, 1);
   int cuts = 0;
   for (int trial = 0; trial < 250; ++trial) {
-    const Bez b = RandomCubic(rng, 100);
+    const Bez b = ToBez(RandomCurve(rng, -100, 100).data());
     const double d = (2 * u(rng) - 1) * 80;
     const V* p = b.data();
     // References: sign changes of cross(B', B'') and of 1 - d kappa.
-    std::vector<double> ref = fitref::SignChanges([&](double t) { return Cross(fitref::Deriv(p, t), fitref::Deriv2(p, t)); });
-    const std::vector<double> folds = fitref::SignChanges([&](double t) { return 1 - d * fitref::Curvature(p, t); });
+    std::vector<double> ref = SignChanges([&](double t) { return Cross(Velocity(p, t), Acceleration(p, t)); });
+    const std::vector<double> folds = SignChanges([&](double t) { return 1 - d * Curvature(p, t); });
     ref.insert(ref.end(), folds.begin(), folds.end());
     EXPECT_EQ(IsBezierValidForOffset(p, d), folds.empty()) << "trial " << trial;
     std::vector<Bez> pieces;
@@ -157,7 +144,7 @@ TEST(GetSegmentsToOffset, CutsAtInflectionsAndWhereTheRadiusEqualsTheDistance) {
       if (i + 1 < pieces.size()) {
         EXPECT_EQ(pieces[i][3], pieces[i + 1][0]);
       }
-      EXPECT_LT(Distance(fitref::Point(pieces[i].data(), 0.3), fitref::Point(p, t0 + 0.3 * (t1 - t0))), 1e-9 * 100);
+      EXPECT_LT(Distance(At(pieces[i].data(), 0.3), At(p, t0 + 0.3 * (t1 - t0))), 1e-9 * 100);
     }
   }
   EXPECT_GT(cuts, 250);
@@ -165,21 +152,15 @@ TEST(GetSegmentsToOffset, CutsAtInflectionsAndWhereTheRadiusEqualsTheDistance) {
 
 TEST(GetSegmentsToOffset, CutsAtCuspsAndStraightTurnarounds) {
   std::mt19937 rng(4);
-  std::uniform_real_distribution<double> u(-50, 50);
+  std::uniform_real_distribution<double> u(0.2, 0.8);
   for (int trial = 0; trial < 50; ++trial) {
-    // Build B' = 3a t^2 + 2b t + c with B'(t0) = 0.
-    const double t0 = 0.2 + 0.6 * (u(rng) + 50) / 100;
-    const D a{u(rng), u(rng)}, bb{u(rng), u(rng)};
-    const D c = a * (-3 * t0 * t0) - bb * (2 * t0);
-    V p[4];
-    p[0] = V{u(rng), u(rng)};
-    p[1] = p[0] + c / 3.0;
-    p[2] = V{bb.x / 3 - p[0].x + 2 * p[1].x, bb.y / 3 - p[0].y + 2 * p[1].y};
-    p[3] = V{a.x + 3 * p[2].x - 3 * p[1].x + p[0].x, a.y + 3 * p[2].y - 3 * p[1].y + p[0].y};
+    const double t0 = u(rng);
+    const Curve cusp = RandomCusp(rng, t0);
+    const V* p = cusp.data();
     for (double d : {0.0, 7.0}) {
       std::vector<Bez> pieces;
       std::vector<double> params;
-      GetSegmentsToOffset(Bez{{p[0], p[1], p[2], p[3]}}, pieces, d, &params);
+      GetSegmentsToOffset(ToBez(p), pieces, d, &params);
       EXPECT_TRUE(Near(params, t0, 1e-6)) << "trial " << trial;
       EXPECT_FALSE(IsBezierValidForOffset(p, d));
       for (const Bez& piece : pieces) EXPECT_TRUE(IsBezierValidForOffset(piece.data(), d));
@@ -206,11 +187,7 @@ TEST(GetSegmentsToOffset, CutsAtCuspsAndStraightTurnarounds) {
 }
 
 TEST(BezierOffset, BadInputGivesNoResult) {
-  const double nan = std::nan(""), inf = std::numeric_limits<double>::infinity();
   const V good[4] = {{0, 0}, {10, 10}, {20, 10}, {30, 0}}, sentinel{-3, -3};
-  const V bad[3][4] = {{{0, 0}, {nan, 10}, {20, 10}, {30, 0}},
-                       {{0, 0}, {10, 10}, {20, inf}, {30, 0}},
-                       {{5, 5}, {5, 5}, {5, 5}, {5, 5}}};  // a dot
   auto expectNothing = [&](const V* p, double d, double tol2) {
     V r[4] = {sentinel, sentinel, sentinel, sentinel};
     double s = -1.0;
@@ -219,16 +196,15 @@ TEST(BezierOffset, BadInputGivesNoResult) {
     for (const V& q : r) EXPECT_EQ(q, sentinel);
     EXPECT_FALSE(p && tol2 > 0 && IsBezierValidForOffset(p, d));
   };
-  for (const auto& p : bad) {
-    expectNothing(p, 3.0, 0.01);
+  for (const Curve& p : kBadCurves) {
+    expectNothing(p.data(), 3.0, 0.01);
     std::vector<Bez> pieces(1);
     std::vector<double> params(2, 0.5);
-    GetSegmentsToOffset(Bez{{p[0], p[1], p[2], p[3]}}, pieces, 3.0, &params);
-    EXPECT_EQ(pieces.size(), 1u);
-    EXPECT_EQ(params.size(), 2u);
+    GetSegmentsToOffset(ToBez(p.data()), pieces, 3.0, &params);
+    EXPECT_TRUE(pieces.size() == 1u && params.size() == 2u);
   }
-  for (double d : {nan, inf}) expectNothing(good, d, 0.01);
-  for (double tol2 : {0.0, -1.0, nan}) expectNothing(good, 3.0, tol2);
+  for (double d : {kNaN, kInf}) expectNothing(good, d, 0.01);
+  for (double tol2 : {0.0, -1.0, kNaN}) expectNothing(good, 3.0, tol2);
   expectNothing(nullptr, 3.0, 0.01);
   double s = -1.0;
   EXPECT_FALSE(FindBezierOffsetCurve(good, nullptr, 3.0, 0.01, s));
@@ -240,6 +216,6 @@ TEST(FindBezierOffsetCurve, UnreachableToleranceFarFromTheOriginStillEnds) {
   // met and is raised to the noise floor instead of splitting forever.
   const V far[4] = {{1e9, 1e9}, {1e9 + 40, 1e9 + 90}, {1e9 + 120, 1e9 + 60}, {1e9 + 100, 1e9}};
   std::vector<Accepted> out;
-  EXPECT_LE(OffsetRecursively(Bez{{far[0], far[1], far[2], far[3]}}, 10.0, 1e-9, 0, out), 40);
+  EXPECT_LE(OffsetRecursively(ToBez(far), 10.0, 1e-9, 0, out), 40);
   EXPECT_FALSE(out.empty());
 }

@@ -1,28 +1,19 @@
+#include "ostracrv/math/bezier_split.h"
+
 #include <gtest/gtest.h>
 
-#include <cmath>
-#include <random>
-
-#include "math/search_reference.h"
-#include "ostracrv/math/bezier_split.h"
+#include "math/test_curves.h"
 
 namespace {
 
-using Framework::common_types::POINT;
-using MavikMath::V;
+using namespace testcurves;
 using namespace MavikMath::CubicBezier;
-using search_ref::At;
-using search_ref::Curve;
 
 // Largest distance between piece(u) and the curve at t0 + (t1 - t0) u over
 // a set of u, relative to the curve's size.
 double Deviation(const V* piece, const Curve& c, double t0, double t1) {
   double worst = 0;
-  for (int k = 0; k <= 32; ++k) {
-    const double u = k / 32.0;
-    const V a = At(piece, u), b = At(c, t0 + (t1 - t0) * u);
-    worst = std::max(worst, std::hypot(a.x - b.x, a.y - b.y));
-  }
+  for (int k = 0; k <= 32; ++k) worst = std::max(worst, MavikMath::Distance(At(piece, k / 32.0), At(c, t0 + (t1 - t0) * k / 32.0)));
   return worst / 100.0;
 }
 
@@ -32,46 +23,33 @@ TEST(BezierSplit, PiecesReproduceTheCurve) {
   std::mt19937 rng(21);
   std::uniform_real_distribution<double> u(0.0, 1.0);
   for (int i = 0; i < 2000; ++i) {
-    const Curve c = search_ref::RandomCurve(rng);
+    const Curve c = RandomCurve(rng);
     double t1 = u(rng), t2 = u(rng);
     if (t1 > t2) std::swap(t1, t2);
 
-    V left[4], right[4];
+    V left[4], right[4], seven[7], ten[10], out[4];
     Split(t1, c.data(), left, right);
     EXPECT_LT(Deviation(left, c, 0, t1), 1e-12);
     EXPECT_LT(Deviation(right, c, t1, 1), 1e-12);
-    EXPECT_EQ(left[3], right[0]);
-    EXPECT_EQ(left[0], c[0]);
-    EXPECT_EQ(right[3], c[3]);
-
-    V seven[7];
+    EXPECT_TRUE(left[3] == right[0] && left[0] == c[0] && right[3] == c[3]);
     Split(t1, c.data(), seven);
-    for (int k = 0; k < 4; ++k) {
-      EXPECT_EQ(seven[k], left[k]);
-      EXPECT_EQ(seven[3 + k], right[k]);
-    }
+    EXPECT_TRUE(std::equal(left, left + 4, seven) && std::equal(right, right + 4, seven + 3));
 
-    V ten[10];
     Split(t2, t1, c.data(), ten);  // unsorted parameters are sorted
     EXPECT_LT(Deviation(ten, c, 0, t1), 1e-12);
     EXPECT_LT(Deviation(ten + 3, c, t1, t2), 1e-12);
     EXPECT_LT(Deviation(ten + 6, c, t2, 1), 1e-12);
     EXPECT_EQ(ten[9], c[3]);
 
-    V out[4];
     LeftOf(t2, c.data(), out);
     EXPECT_LT(Deviation(out, c, 0, t2), 1e-12);
     RightOf(t2, c.data(), out);
     EXPECT_LT(Deviation(out, c, t2, 1), 1e-12);
-    Subsection(t1, t2, c.data(), out);
-    EXPECT_LT(Deviation(out, c, t1, t2), 1e-12);
-    Subsection(0.0, t2, c.data(), out);
-    EXPECT_LT(Deviation(out, c, 0, t2), 1e-12);
-    Subsection(t1, 1.0, c.data(), out);
-    EXPECT_LT(Deviation(out, c, t1, 1), 1e-12);
-    // Reversed parameters give the piece running backwards.
-    Subsection(t2, t1, c.data(), out);
-    EXPECT_LT(Deviation(out, c, t2, t1), 1e-12);
+    // Subsections, the backward one (reversed parameters) running backwards.
+    for (auto [a, b] : {std::pair{t1, t2}, std::pair{0.0, t2}, std::pair{t1, 1.0}, std::pair{t2, t1}}) {
+      Subsection(a, b, c.data(), out);
+      EXPECT_LT(Deviation(out, c, a, b), 1e-12);
+    }
   }
 }
 
@@ -79,30 +57,23 @@ TEST(BezierSplit, PiecesReproduceTheCurve) {
 TEST(BezierSplit, InPlace) {
   std::mt19937 rng(22);
   for (int i = 0; i < 200; ++i) {
-    const Curve c = search_ref::RandomCurve(rng);
-    V buf[10];
-    std::copy(c.begin(), c.end(), buf);
-    V expectL[4], expectR[4];
+    const Curve c = RandomCurve(rng);
+    V buf[10], expectL[4], expectR[4], r[4];
     Split(0.3, c.data(), expectL, expectR);
-    V r[4];
+    std::copy(c.begin(), c.end(), buf);
     Split(0.3, buf, buf, r);  // left shares storage with the input
-    for (int k = 0; k < 4; ++k) EXPECT_EQ(buf[k], expectL[k]);
-    for (int k = 0; k < 4; ++k) EXPECT_EQ(r[k], expectR[k]);
-
+    EXPECT_TRUE(std::equal(buf, buf + 4, expectL) && std::equal(r, r + 4, expectR));
     std::copy(c.begin(), c.end(), buf);
     Split(0.3, buf, buf);  // seven points over the input
-    for (int k = 0; k < 4; ++k) EXPECT_EQ(buf[3 + k], expectR[k]);
-
+    EXPECT_TRUE(std::equal(buf + 3, buf + 7, expectR));
     std::copy(c.begin(), c.end(), buf);
     Split(0.2, 0.6, buf, buf);
     EXPECT_LT(Deviation(buf + 3, c, 0.2, 0.6), 1e-12);
-
     for (auto f : {&LeftOf<V>, &RightOf<V>}) {
       std::copy(c.begin(), c.end(), buf);
-      V expect[4];
-      f(0.7, c.data(), expect);
+      f(0.7, c.data(), r);
       f(0.7, buf, buf);
-      for (int k = 0; k < 4; ++k) EXPECT_EQ(buf[k], expect[k]);
+      EXPECT_TRUE(std::equal(buf, buf + 4, r));
     }
     std::copy(c.begin(), c.end(), buf);
     Subsection(0.1, 0.8, buf, buf);
@@ -114,16 +85,13 @@ TEST(BezierSplit, InPlace) {
 // with the input's own end points kept exactly.
 TEST(BezierSplit, IntegerPiecesAreRounded) {
   const POINT c[4] = {POINT{-7, 3}, POINT{10, -21}, POINT{33, 40}, POINT{-5, 9}};
-  V cv[4];
-  for (int k = 0; k < 4; ++k) cv[k] = V{double(c[k].x), double(c[k].y)};
+  const V cv[4] = {V{-7, 3}, V{10, -21}, V{33, 40}, V{-5, 9}};
   POINT ten[10];
   V tenv[10];
   Split(0.25, 0.75, c, ten);
   Split(0.25, 0.75, cv, tenv);
-  for (int k = 0; k < 10; ++k)
-    EXPECT_EQ(ten[k], (POINT{MavikMath::RoundToInt(tenv[k].x), MavikMath::RoundToInt(tenv[k].y)}));
-  EXPECT_EQ(ten[0], c[0]);
-  EXPECT_EQ(ten[9], c[3]);
+  for (int k = 0; k < 10; ++k) EXPECT_EQ(ten[k], (POINT{MavikMath::RoundToInt(tenv[k].x), MavikMath::RoundToInt(tenv[k].y)}));
+  EXPECT_TRUE(ten[0] == c[0] && ten[9] == c[3]);
 }
 
 }  // namespace

@@ -6,15 +6,14 @@
 #include <limits>
 #include <vector>
 
-#include "math/eval_test_curves.h"
+#include "math/test_curves.h"
 #include "ostracrv/math/rect.h"
 
 namespace {
 
+using namespace testcurves;
 using namespace MavikMath;
-using Framework::common_types::POINT;
 using Framework::common_types::RECT;
-using evaltest::At;
 
 // Largest distance from the curve to its chords, piece by piece: the curve
 // between ts[k] and ts[k + 1] against the chord poly[k] - poly[k + 1].
@@ -23,7 +22,7 @@ double PieceDeviation(const V* p, const T* poly, const std::vector<double>& ts) 
   double worst = 0;
   for (std::size_t k = 0; k + 1 < ts.size(); ++k)
     for (int i = 0; i <= 64; ++i)
-      worst = std::max(worst, evaltest::SegmentDistance(At(p, ts[k] + (ts[k + 1] - ts[k]) * i / 64), ToV(poly[k]), ToV(poly[k + 1])));
+      worst = std::max(worst, SegmentDistance(At(p, ts[k] + (ts[k + 1] - ts[k]) * i / 64), ToV(poly[k]), ToV(poly[k + 1])));
   return worst;
 }
 
@@ -31,7 +30,7 @@ double PieceDeviation(const V* p, const T* poly, const std::vector<double>& ts) 
 // the curve passes through it (within 1e-9 of its size); empty if a vertex
 // is off the curve or out of order.
 std::vector<double> VertexParameters(const V* p, const V* poly, int count) {
-  const double size = std::max(evaltest::Size(p), 1e-300), h = 1e-4;
+  const double size = std::max(Size(p), 1e-300), h = 1e-4;
   double speed = 0;
   for (int i = 0; i < 3; ++i) speed = std::max(speed, 3 * Distance(p[i], p[i + 1]));
   std::vector<double> ts = {0.0};
@@ -39,12 +38,8 @@ std::vector<double> VertexParameters(const V* p, const V* poly, int count) {
     bool found = false;
     for (double t = ts.back(); t <= 1 + h && !found; t += h) {
       if (Distance(At(p, std::min(t, 1.0)), poly[k]) > speed * h * 1.01 + 1e-12 * size) continue;
-      double lo = std::max(ts.back(), t - h), hi = std::min(1.0, t + h);  // ternary search for the nearest
-      for (int it = 0; it < 100; ++it) {
-        const double m1 = lo + (hi - lo) / 3, m2 = hi - (hi - lo) / 3;
-        if (Distance(At(p, m1), poly[k]) < Distance(At(p, m2), poly[k])) hi = m2; else lo = m1;
-      }
-      if ((found = Distance(At(p, lo), poly[k]) <= 1e-9 * size)) ts.push_back(lo);
+      const double at = GoldenMin([&](double u) { return Distance(At(p, u), poly[k]); }, std::max(ts.back(), t - h), std::min(1.0, t + h));
+      if ((found = Distance(At(p, at), poly[k]) <= 1e-9 * size)) ts.push_back(at);
     }
     if (!found) return {};
   }
@@ -66,17 +61,17 @@ TEST(BezierToLines, SamplesAtEqualParameterSteps) {
     }
   }
   V keep[4] = {{7, 7}};
-  const V bad[4] = {{0, 0}, {std::nan(""), 0}, {1, 1}, {2, 2}};
   EXPECT_EQ(BezierToLines(p, keep, 0), 0);
-  EXPECT_EQ(BezierToLines(bad, keep, 3), 0);
+  EXPECT_EQ(BezierToLines(kBadCurves[0].data(), keep, 3), 0);
+  EXPECT_EQ(BezierToLines(kBadCurves[1].data(), keep, 3), 0);
   EXPECT_EQ(keep[0], (V{7, 7}));
 }
 
 TEST(AdaptiveBezierToLines, StaysWithinToleranceWithNoMoreChordsThanUniformSteps) {
   std::vector<V> out(4096);
-  for (const evaltest::Curve& c : evaltest::RandomCurves(250, 81))
+  for (const FamilyCurve& c : RandomCurves(250, 81))
     for (double rel : {1e-1, 1e-2, 1e-3}) {
-      const double tol = rel * std::max(evaltest::Size(c.p), 1e-9);
+      const double tol = rel * std::max(Size(c.p), 1e-9);
       const int n = AdaptiveBezierToLines(c.p, out.data(), tol, 4096);
       ASSERT_GE(n, 2);
       EXPECT_TRUE(out[0] == c.p[0] && out[n - 1] == c.p[3]);
@@ -102,23 +97,21 @@ TEST(AdaptiveBezierToLines, BudgetIntegerRoundingAndBadInput) {
     ASSERT_GE(k, 2);
     for (int i = 0; i <= 4000; ++i) {  // every curve point near some chord
       double best = INFINITY;
-      for (int s = 0; s + 1 < k; ++s) best = std::min(best, evaltest::SegmentDistance(At(p, i / 4000.0), ToV(iout[s]), ToV(iout[s + 1])));
+      for (int s = 0; s + 1 < k; ++s) best = std::min(best, SegmentDistance(At(p, i / 4000.0), ToV(iout[s]), ToV(iout[s + 1])));
       ASSERT_LE(best, tol);
     }
     for (int i = 1; i + 1 < k; ++i) EXPECT_NE(iout[i], iout[i - 1]);  // no repeats from rounding
   }
   V keep[3] = {{9, 9}};
-  const V bad[4] = {{0, 0}, {INFINITY, 0}, {1, 1}, {2, 2}};
-  EXPECT_EQ(AdaptiveBezierToLines(p, keep, 0.0, 3), 0);
-  EXPECT_EQ(AdaptiveBezierToLines(p, keep, std::nan(""), 3), 0);
+  for (double tol : {0.0, kNaN}) EXPECT_EQ(AdaptiveBezierToLines(p, keep, tol, 3), 0);
   EXPECT_EQ(AdaptiveBezierToLines(p, keep, 1.0, 1), 0);
-  EXPECT_EQ(AdaptiveBezierToLines(bad, keep, 1.0, 3), 0);
+  for (const Curve& bad : {kBadCurves[0], kBadCurves[1]}) EXPECT_EQ(AdaptiveBezierToLines(bad.data(), keep, 1.0, 3), 0);
   EXPECT_EQ(keep[0], (V{9, 9}));
 }
 
 TEST(CalculateNumBezierLines, UniformStepsOfThatCountMeetTheTolerance) {
   std::vector<V> out(kMaxBezierLines + 1);
-  for (const evaltest::Curve& c : evaltest::RandomCurves(300, 91))
+  for (const FamilyCurve& c : RandomCurves(300, 91))
     for (int tol : {1, 3, 10}) {
       const V s[4] = {c.p[0] * 20.0, c.p[1] * 20.0, c.p[2] * 20.0, c.p[3] * 20.0};
       const int n = CalculateNumBezierLines(s, tol);

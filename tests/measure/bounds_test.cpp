@@ -81,7 +81,7 @@ TEST(BoundsRounding, IntegerBulgeRoundsOutward) {
   const POINT down[] = {{0, 0}, {0, -13}, {10, -14}, {10, 0}};
   const NODETYPE nodes[] = {NodeTypes::Open::move, NodeTypes::arc, NodeTypes::arc, NodeTypes::Open::curve};
   double top = 0;
-  for (int k = 0; k <= 100000; ++k) top = std::max(top, sampled::Bernstein(up, k / 100000.0).y);
+  for (int k = 0; k <= 100000; ++k) top = std::max(top, testgeo::Bezier(up, k / 100000.0).y);
   ASSERT_GT(top - std::floor(top), 0.01);  // really between whole numbers
   EXPECT_EQ(OstraCrv::GetTightBBox(up, nodes, 4).top, int(std::ceil(top)));
   EXPECT_EQ(OstraCrv::GetTightBBox(down, nodes, 4).bottom, -int(std::ceil(top)));

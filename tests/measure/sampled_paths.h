@@ -1,5 +1,5 @@
 // Random paths with coordinates, and independent references for measuring
-// them: a Bernstein evaluation written here (not the library's), dense
+// them: the Bernstein evaluation of path_geometry.h (not the library's), dense
 // sampling of every segment, and the subpath structure recorded when the path
 // was made (random_paths.h).
 #pragma once
@@ -8,7 +8,7 @@
 #include <random>
 #include <vector>
 
-#include "core/random_paths.h"
+#include "core/path_geometry.h"
 #include "polycurve.h"
 
 namespace sampled {
@@ -16,23 +16,10 @@ namespace sampled {
 using Framework::common_types::POINT;
 using MavikMath::V;
 
-// The point at t of the cubic through p[0..3], by the Bernstein polynomials.
-template <class T>
-V Bernstein(const T* p, double t) {
-  const double s = 1.0 - t;
-  const double w[4] = {s * s * s, 3 * s * s * t, 3 * s * t * t, t * t * t};
-  V r{0, 0};
-  for (int k = 0; k < 4; ++k) {
-    r.x += w[k] * double(p[k].x);
-    r.y += w[k] * double(p[k].y);
-  }
-  return r;
-}
-
 // The point at t of the segment recorded in seg.
 template <class T>
 V SegmentPoint(const std::vector<T>& pts, const testpaths::Segment& seg, double t) {
-  if (seg.bezier) return Bernstein(pts.data() + seg.start, t);
+  if (seg.bezier) return testgeo::Bezier(pts.data() + seg.start, t);
   const V a = MavikMath::ToV(pts[seg.start]), b = MavikMath::ToV(pts[seg.end]);
   return V{a.x + (b.x - a.x) * t, a.y + (b.y - a.y) * t};
 }

@@ -5,6 +5,7 @@
 // the measurements of the library in library coordinates (y up).
 #include <cstdio>
 #include <iostream>
+#include <map>
 #include <sstream>
 
 #include "common.h"
@@ -20,7 +21,9 @@ const char* const kInfoHelp =
     "of its subpaths: the nodes a user sees, the points stored (nodes plus\n"
     "Bezier control points and the repeated closing point), the segments, whether\n"
     "it is closed, whether its node bytes are valid, its area, its length and\n"
-    "its tight bounds.\n"
+    "its tight bounds. A closed subpath also shows its depth among the subpaths\n"
+    "of its path: 1 an outline, 2 a hole in it, 3 an island in the hole, and so\n"
+    "on (subpaths that cross each other are placed by one inner point).\n"
     "\n"
     "Coordinates have y pointing up (the document is mirrored through the middle\n"
     "of its view box); the area is positive for a subpath drawn clockwise on\n"
@@ -53,6 +56,22 @@ Facts Measure(V const* pts, NODETYPE const* nodes, int n) {
   f.length = OstraCrv::GetLength(pts, nodes, n);
   OstraCrv::GetTightBBox(pts, nodes, n, f.bounds);
   return f;
+}
+
+// Depth of every subpath in the containment tree, by its first node: 1 for
+// an outline, 2 for a hole, 3 for an island in a hole, and so on.
+void CollectDepths(const OstraCrv::SubpathTreeNode& n, NODETYPE const* nodes, int depth, std::map<int, int>& out) {
+  for (unsigned long i = 0; i < n.GetNumberOfChildren(); ++i) {
+    const auto& c = n.GetChild(i);
+    const int d = c.count ? depth + 1 : depth;  // group nodes add no level
+    if (c.count) out[int(c.nodes - nodes)] = d;
+    CollectDepths(c, nodes, d, out);
+  }
+}
+
+std::string DepthName(int depth) {
+  if (depth == 1) return "outline";
+  return depth % 2 == 0 ? "hole" : "island";
 }
 
 std::string Describe(const Facts& f, int digits) {
@@ -115,13 +134,21 @@ int RunInfo(const std::vector<std::string>& argv) {
               << CRV_NumSubpaths(nodes, n) << (CRV_NumSubpaths(nodes, n) == 1 ? " subpath" : " subpaths") << "\n"
               << "  whole: " << Describe(Measure(pts, nodes, n), digits) << "\n";
     if (!shape.problem.empty()) std::cout << "  incomplete: " << shape.problem << "\n";
+    std::map<int, int> depths;
+    if (n > 0) {
+      const OstraCrv::SubpathHierarchy tree(pts, nodes, n, false);
+      CollectDepths(tree.GetRoot(), nodes, 0, depths);
+    }
     int sub = 0;
     for (int first = 0; first < n;) {
       const int count = CRV_CountNodesInSubpath(nodes + first, first, n);
       ++sub;
       const bool closed = IsClosedNode(nodes[first]);
       std::cout << "  subpath " << sub << ": " << (count == 1 ? "lone move" : closed ? "closed" : "open") << ", "
-                << Describe(Measure(pts + first, nodes + first, count), digits) << "\n";
+                << Describe(Measure(pts + first, nodes + first, count), digits);
+      if (closed && count > 1 && depths.count(first))
+        std::cout << ", depth " << depths[first] << " (" << DepthName(depths[first]) << ")";
+      std::cout << "\n";
       first += count;
     }
   }

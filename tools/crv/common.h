@@ -46,10 +46,14 @@ struct Args {
 // The subcommands: each takes the arguments after its name.
 int RunInfo(const std::vector<std::string>& args);
 int RunRender(const std::vector<std::string>& args);
-// union, intersect, subtract, xor: command is the name.
-int RunWeld(const std::string& command, const std::vector<std::string>& args);
+int RunInside(const std::vector<std::string>& args);
+int RunIntersectPoints(const std::vector<std::string>& args);
 extern const char* const kInfoHelp;
 extern const char* const kRenderHelp;
+extern const char* const kInsideHelp;
+extern const char* const kIntersectPointsHelp;
+// union, intersect, subtract, xor: command is the name.
+int RunWeld(const std::string& command, const std::vector<std::string>& args);
 extern const char* const kWeldHelp;
 
 }  // namespace crv

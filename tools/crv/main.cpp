@@ -21,6 +21,11 @@ const char* const kHelp =
     "                                bounds of every path and subpath\n"
     "  render FILE.svg -o OUT.svg    draw the paths with nodes, control points and handles\n"
     "                                marked (--png also writes a PNG)\n"
+    "  intersect-points A.svg [B.svg] [-o OUT.svg]\n"
+    "                                crossings, touches and shared stretches of the\n"
+    "                                paths, listed (and drawn with -o)\n"
+    "  inside FILE.svg X Y           whether a point lies inside each path, by the non-zero\n"
+    "                                and the even-odd rule\n"
     "  union A.svg B.svg -o OUT.svg  the filled area of A or B; also intersect (A and B),\n"
     "                                subtract (A and not B) and xor (exactly one)\n"
     "  help [COMMAND]                this text, or the help of one command\n"
@@ -47,6 +52,8 @@ int main(int argc, char** argv) {
   args.erase(args.begin());
   if (command == "info") return crv::RunInfo(args);
   if (command == "render") return crv::RunRender(args);
+  if (command == "inside") return crv::RunInside(args);
+  if (command == "intersect-points") return crv::RunIntersectPoints(args);
   if (command == "union" || command == "intersect" || command == "subtract" || command == "xor")
     return crv::RunWeld(command, args);
   if (command == "help" || command == "--help" || command == "-h") {
@@ -60,6 +67,14 @@ int main(int argc, char** argv) {
     }
     if (args[0] == "render") {
       std::cout << crv::kRenderHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "inside") {
+      std::cout << crv::kInsideHelp;
+      return crv::kOk;
+    }
+    if (args[0] == "intersect-points") {
+      std::cout << crv::kIntersectPointsHelp;
       return crv::kOk;
     }
     if (args[0] == "union" || args[0] == "intersect" || args[0] == "subtract" || args[0] == "xor") {

@@ -153,6 +153,17 @@ class CurveSegmentT {
   // control-point boxes.
   bool DoesIntersectWith(CurveSegmentT other, bool includeProximity) const;
 
+  // ---- Appending ----
+  //
+  // Appends the view's piece to target, attached wherever target ends (no
+  // check that the points agree): a move view moves a final lone move of the
+  // target, or else starts a subpath; a line or curve view adds its end (with
+  // its control points), preceded by a move to its start only when target is
+  // empty. With keepClosed, a closing segment (closed bit on its end node)
+  // then closes target's last subpath with CloseLastSubpath(0.0, false), so
+  // no line is added. An invalid view appends nothing.
+  void AppendTo(PolycurveT<T>& target, bool keepClosed) const;
+
  private:
   static T const& Zero() noexcept {
     static const T zero{};

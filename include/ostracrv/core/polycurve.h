@@ -36,15 +36,12 @@
 #include "ostracrv/core/curveposition.h"
 #include "ostracrv/core/mavikutils.h"
 #include "ostracrv/core/nodetype.h"
+#include "ostracrv/core/subcurve_range.h"
 #include "ostracrv/math/matrix.h"
 #include "ostracrv/math/rect.h"
-#include "ostracrv/core/subcurve_range.h"
+#include "ostracrv/math/side.h"
 #include "ostracrv/math/vector2d.h"
 #include "ostracrv/weld/weldflags.h"
-
-namespace MavikMath {
-struct MATRIX;
-}
 
 namespace OstraCrv {
 
@@ -255,84 +252,6 @@ class PolycurveT {
   void Append(T const* points, NODETYPE const* nodes, unsigned long m);
 
  public:
-  // ---- Measurement ----
-  // Thin wrappers over the raw measures of the measure/ headers (bounds.h,
-  // area.h, length.h, pointoncurve.h, tangents.h) on this curve's arrays;
-  // each answers what its raw form answers for bad input.
-
-  // Tight box around the true shape, rounded outward; empty for an empty
-  // curve.
-  Framework::common_types::RECT GetTightBBox() const;
-  // Box of all points, control points included, rounded outward.
-  Framework::common_types::RECT GetLooseBBox() const;
-  // Tight box of the segments that touch an enabled node; empty if none.
-  Framework::common_types::RECT GetTightEnabledBBox() const;
-  // Tight box after the transform, in doubles.
-  MavikMath::BoundsT<double> GetTightTransformedBBox(MavikMath::MATRIX const& m) const;
-  // Box of every point (control points included) after the transform.
-  MavikMath::BoundsT<double> GetLooseTransformedBBox(MavikMath::MATRIX const& m) const;
-  // Signed area of the closed subpaths, positive for clockwise (y up).
-  double GetArea() const;
-  // Length of all segments, at accuracy 10.
-  double GetLength() const;
-  // The point at t on the segment that ends at node i (rounded for integer
-  // curves); the zero point, or false, where that segment does not exist.
-  T GetPointOnCurve(unsigned long i, double t) const;
-  bool GetPointOnCurve(unsigned long i, double t, T& out) const;
-  // The same at a position's end node and t; the zero point, or false, for a
-  // position whose segment is negative.
-  T GetPointOnCurve(CurvePosition const& pos) const;
-  bool GetPointOnCurve(CurvePosition const& pos, T& out) const;
-  // In doubles without rounding, for an integer curve.
-  bool GetPointOnCurve(unsigned long i, double t, MavikMath::V& out) const
-    requires(!std::is_same_v<T, MavikMath::V>);
-  // In doubles without rounding; the zero point where there is no segment.
-  MavikMath::V GetPoint2dOnCurve(unsigned long i, double t) const;
-  // Some point on the curve: the middle of the first segment if node 1 is a
-  // line or node 3 a curve; otherwise the zero point.
-  T GetPointOnCurve() const;
-  // Derivative at t of the segment ending at i; see tangents.h.
-  MavikMath::D GetTangentAt(unsigned long i, double t, bool normalise) const;
-  // Direction in which the curve leaves node i, or arrives from behind it
-  // (pointing away from i); (0, 0) where there is none.
-  MavikMath::D GetForwardTangentAt(int i) const;
-  MavikMath::D GetReverseTangentAt(int i) const;
-  // Signed curvature just after / just before node i, positive for a left
-  // turn; 0.0 on lines and where there is no segment.
-  double GetForwardCurvatureAt(int i) const;
-  double GetReverseCurvatureAt(int i) const;
-  // Whether the segment ending at i passes centre clockwise at t; tangent,
-  // if not null, receives the direction of travel there.
-  bool IsClockwise(unsigned long i, double t, T const& centre, MavikMath::D* tangent) const;
-  // Whether node i is a corner: marked cusp and its two sides not opposite.
-  bool IsCuspNode(unsigned long i) const;
-  // The number of line and curve nodes.
-  int GetNumberOfSegments() const;
-  // True if the curve is not empty and holds only move and line nodes.
-  bool AllLineSegments() const;
-
- public:
-  // ---- Closest points ----
-  // See closest.h for the searches.
-
-  // The nearest point of the curve to p; false, out unchanged, if the curve
-  // has no segment or p is not finite.
-  bool FindClosestPoint(T p, ClosestPoint<T, CurvePosition>& out) const;
-  // The nearest end of an open subpath of more than one node: node is set to
-  // 0, then to that end's index; true if such an end exists.
-  bool FindClosestOpenPoint(T p, unsigned long& node) const;
-  // Whether the nearest point of the curve lies within tolerance of p
-  // (squared distance at most tolerance squared). False for an empty curve,
-  // a curve without segments or non-finite input.
-  bool IsPointOnCurve(T const& p, double tolerance) const;
-  // The length from the start of the curve to its nearest point to p; 0.0
-  // if there is none.
-  double GetLengthAlongCurveTo(T p) const;
-  // The length from the start of the curve, across subpaths, to t on the
-  // segment ending at endNode; and from there to the end of the curve.
-  double GetLengthAlongCurveTo(unsigned long endNode, double t) const;
-  double GetLengthFrom(unsigned long endNode, double t) const;
-
   // ---- Building: appends, joins, closing, cutting, makers ----
   //
   // Each forks the storage first. The plain appends do not validate: a curve
@@ -360,6 +279,10 @@ class PolycurveT {
   // direction tangent (a line where no arc fits). False, with nothing changed,
   // on an empty curve or when no arc or line can be built (non-finite input).
   bool CircularArcTo(T const& p, MavikMath::vector2dT<double, false> const& tangent);
+  // The same with the direction in which the curve arrives at its end; after
+  // a lone first node, the chord turned a quarter counter-clockwise, which
+  // gives a clockwise half circle bulging to the left of the chord.
+  bool CircularArcTo(T const& p);
 
   // Appends p as a start node unless the curve ends exactly at p; then the
   // last node only takes over the enabled bit and the continuity of node.
@@ -378,6 +301,17 @@ class PolycurveT {
   // appended whole. closeAfter then tries CloseLastSubpath(tolerance, false).
   // An empty other changes nothing.
   void AppendWithJoin(PolycurveT const& other, bool closeAfter, double tolerance);
+  // Appends other and welds its ends to the nearest open ends of this curve
+  // (FindClosestOpenPointOnCurve; squared distances at most tolerance
+  // squared; if both ends find the same node, the farther one searches again
+  // without it). The weld is asked with this curve's old last node standing
+  // in for other's first node, an established quirk: a weld of other's first
+  // end joins its nearest open end to this curve's old last node, a weld of
+  // other's last end joins it to its nearest open end, and with both ends
+  // within tolerance the request is refused. Returns whether a weld was
+  // made; the append stays in any case. An empty other changes nothing; on
+  // an empty curve other is appended.
+  bool JoinEndpoints(PolycurveT const& other, double tolerance);
 
   // Closes the last subpath when it has at least three nodes and its ends lie
   // within tolerance: both ends move to their midpoint (the integer form
@@ -538,6 +472,170 @@ class PolycurveT {
   // order. With dropDangling, open stretches of a single node are removed
   // from this curve and not returned. O(n).
   PolycurveT ExtractOpenSubpaths(bool dropDangling);
+  // Closes the subpath that holds node: the selection is replaced by its two
+  // ends, which are then joined with a line where they do not meet
+  // (JoinEnabledAddingLineSegments). A subpath of a single line stays open.
+  // False for a node out of range or a single-node subpath; true otherwise,
+  // also when nothing could be closed.
+  bool CloseSubpath(unsigned long node);
+  // Opens every closed subpath at its closing point; no node is added, and
+  // the segments stay. Stray moves are tidied away. O(n) per closed subpath.
+  void OpenAllSubpaths();
+
+ public:
+  // ---- Measurement ----
+  // Thin wrappers over the raw measures of the measure/ headers (bounds.h,
+  // area.h, length.h, pointoncurve.h, tangents.h) on this curve's arrays;
+  // each answers what its raw form answers for bad input.
+
+  // Tight box around the true shape, rounded outward; empty for an empty
+  // curve.
+  Framework::common_types::RECT GetTightBBox() const;
+  // Box of all points, control points included, rounded outward.
+  Framework::common_types::RECT GetLooseBBox() const;
+  // Tight box of the segments that touch an enabled node; empty if none.
+  Framework::common_types::RECT GetTightEnabledBBox() const;
+  // Tight box after the transform, in doubles.
+  MavikMath::BoundsT<double> GetTightTransformedBBox(MavikMath::MATRIX const& m) const;
+  // Box of every point (control points included) after the transform.
+  MavikMath::BoundsT<double> GetLooseTransformedBBox(MavikMath::MATRIX const& m) const;
+  // Signed area of the closed subpaths, positive for clockwise (y up).
+  double GetArea() const;
+  // Length of all segments, at accuracy 10.
+  double GetLength() const;
+  // The point at t on the segment that ends at node i (rounded for integer
+  // curves); the zero point, or false, where that segment does not exist.
+  T GetPointOnCurve(unsigned long i, double t) const;
+  bool GetPointOnCurve(unsigned long i, double t, T& out) const;
+  // The same at a position's end node and t; the zero point, or false, for a
+  // position whose segment is negative.
+  T GetPointOnCurve(CurvePosition const& pos) const;
+  bool GetPointOnCurve(CurvePosition const& pos, T& out) const;
+  // In doubles without rounding, for an integer curve.
+  bool GetPointOnCurve(unsigned long i, double t, MavikMath::V& out) const
+    requires(!std::is_same_v<T, MavikMath::V>);
+  // In doubles without rounding; the zero point where there is no segment.
+  MavikMath::V GetPoint2dOnCurve(unsigned long i, double t) const;
+  // Some point on the curve: the middle of the first segment if node 1 is a
+  // line or node 3 a curve; otherwise the zero point.
+  T GetPointOnCurve() const;
+  // Derivative at t of the segment ending at i; see tangents.h.
+  MavikMath::D GetTangentAt(unsigned long i, double t, bool normalise) const;
+  // Direction in which the curve leaves node i, or arrives from behind it
+  // (pointing away from i); (0, 0) where there is none.
+  MavikMath::D GetForwardTangentAt(int i) const;
+  MavikMath::D GetReverseTangentAt(int i) const;
+  // Signed curvature just after / just before node i, positive for a left
+  // turn; 0.0 on lines and where there is no segment.
+  double GetForwardCurvatureAt(int i) const;
+  double GetReverseCurvatureAt(int i) const;
+  // Whether the segment ending at i passes centre clockwise at t; tangent,
+  // if not null, receives the direction of travel there.
+  bool IsClockwise(unsigned long i, double t, T const& centre, MavikMath::D* tangent) const;
+  // Whether node i is a corner: marked cusp and its two sides not opposite.
+  bool IsCuspNode(unsigned long i) const;
+  // The number of line and curve nodes.
+  int GetNumberOfSegments() const;
+  // True if the curve is not empty and holds only move and line nodes.
+  bool AllLineSegments() const;
+
+ public:
+  // ---- Closest points ----
+  // See closest.h for the searches.
+
+  // The nearest point of the curve to p; false, out unchanged, if the curve
+  // has no segment or p is not finite.
+  bool FindClosestPoint(T p, ClosestPoint<T, CurvePosition>& out) const;
+  // The nearest end of an open subpath of more than one node: node is set to
+  // 0, then to that end's index; true if such an end exists.
+  bool FindClosestOpenPoint(T p, unsigned long& node) const;
+  // Whether the nearest point of the curve lies within tolerance of p
+  // (squared distance at most tolerance squared). False for an empty curve,
+  // a curve without segments or non-finite input.
+  bool IsPointOnCurve(T const& p, double tolerance) const;
+  // The length from the start of the curve to its nearest point to p; 0.0
+  // if there is none.
+  double GetLengthAlongCurveTo(T p) const;
+  // The length from the start of the curve, across subpaths, to t on the
+  // segment ending at endNode; and from there to the end of the curve.
+  double GetLengthAlongCurveTo(unsigned long endNode, double t) const;
+  double GetLengthFrom(unsigned long endNode, double t) const;
+
+ public:
+  // ---- Node selection ----
+  // The enabled bit of each node (see node_selection.h). Every method that
+  // changes bits forks first; none of them keeps the twins of a closed
+  // subpath in step unless it says so. An arc that loses the enabled bit
+  // loses its user bit as well (a control point is offered only while it
+  // follows the selection).
+
+  // Indices of the nodes with the enabled bit, in order; arcs only with
+  // includeArcs.
+  std::vector<unsigned long> GetEnabledNodes(bool includeArcs) const;
+  // Filters indices in list order, dropping those out of range and those not
+  // enabled. With treatArcsByNeighbours an arc stays only when the node kept
+  // before it was enabled and the Bezier's end node is an enabled curve: a
+  // control point counts as selected when both ends of its Bezier are.
+  std::vector<unsigned long> GetEnabledNodesFrom(std::vector<unsigned long> indices,
+                                                 bool treatArcsByNeighbours) const;
+  std::vector<unsigned long> GetEnabledNodesFrom(SubcurveRange range, bool treatArcsByNeighbours) const;
+  // Enabled non-arc nodes that are the first or last node of an open subpath.
+  std::vector<unsigned long> GetEnabledOpenEndNodes() const;
+  // Clears the selection (CRV_DisableAllNodes), then enables each listed
+  // index inside the curve.
+  void SetEnabledNodes(std::vector<unsigned long> const& indices);
+  void DisableAllNodes();
+  // Enables every node and refreshes the arc marks.
+  void EnableAllNodes();
+  // The arc refresh; returns the number of selected nodes.
+  int EnableAllControls();
+  // Every node gets the enabled bit exactly when it is an end of an open
+  // (respectively closed) subpath.
+  void EnableFirstAndLastInOpenSubpaths();
+  void EnableFirstAndLastInClosedSubpaths();
+  // One bit of node i; ignored out of range.
+  void SetEnabled(unsigned long i, bool on);
+  // The bit on first .. first+count-1, cut at the size.
+  void SetEnabled(unsigned long first, unsigned long count, bool on);
+  // The bit on all nodes of node's subpath, arcs included; ignored out of
+  // range.
+  void SetSubpathEnabled(unsigned long node, bool on);
+  // Whether any byte, arcs included, has the enabled bit.
+  bool AnyEnabled() const;
+  // The bit of node i; false out of range.
+  bool IsEnabled(unsigned long i) const;
+  // Clears the selection, then copies the enabled bit of other's first
+  // min(count, other's count) nodes. other may be this curve.
+  void CopyEnabledFrom(PolycurveT other);
+
+ public:
+  // ---- Structural node edits ----
+
+  // Joins the selected open ends, bridging gaps with lines (see
+  // CRV_JoinEnabledAddingLineSegments). Returns whether the join ran (false,
+  // nothing changed, with fewer than two selected open ends).
+  bool JoinEnabledAddingLineSegments();
+  // Breaks the curve at t on the segment that ends at node i (see
+  // CRV_BreakAtLocation). Returns whether it broke; nothing changes on an
+  // empty curve or a position that cannot be broken.
+  bool BreakAt(unsigned long i, double t);
+
+ public:
+  // ---- Point in shape ----
+  // See point_in_shape.h, point_in_shape_interior.h and curve_side.h.
+
+  // Whether p lies inside the closed subpaths of the curve, by non-zero
+  // winding or by even-odd; a point on the outline answers resultOnEdge.
+  bool IsPointInShape(T const& p, bool resultOnEdge, bool nonZero) const;
+  // Some point strictly inside the curve's shape (GetPointInShape); false,
+  // out unchanged, if none is found.
+  bool FindPointInShape(T& out) const;
+  // The side of the nearest segment on which p lies, in its forward frame
+  // with y up; SideNone on the curve or for a curve without segments.
+  MavikMath::Side GetSide(T const& p) const;
+  // The side of this curve on which a point inside `other` lies; SideNone if
+  // no point inside other is found.
+  MavikMath::Side OnLeftOrRight(PolycurveT const& other) const;
 
  public:
   // ---- Welding ----

@@ -38,6 +38,10 @@
 // left (counter-clockwise) turn with the y axis up, cross(B', B'') / |B'|^3,
 // and 0 on a line; welding breaks ties of tangent direction by it.
 //
+// Distances are compared squared, each test as stated: ends and touches match
+// when strictly closer than their tolerance; the joint and loop filters keep a
+// crossing only when strictly farther.
+//
 // The point arrays of the pair tests are the whole arrays of the two curves:
 // the segments' firstNode gives their place. The integer forms widen every
 // point to double and test in double, except the box test. No square root in

@@ -74,8 +74,10 @@ struct IntersectionCurveT {
   std::vector<int> intersectsWith;  // the curves it meets, without duplicates
 
   IntersectionCurveT() = default;
-  IntersectionCurveT(T const* points_, NODETYPE const* nodes_, int count_, bool active_, bool selfTest_)
-      : points(points_), nodes(nodes_), count(count_), active(active_), selfTest(selfTest_) {}
+  IntersectionCurveT(T const* points_, NODETYPE const* nodes_, int count_, bool active_, bool selfTest_,
+                     bool callerMark_ = false)
+      : points(points_), nodes(nodes_), count(count_), active(active_), selfTest(selfTest_),
+        callerMark(callerMark_) {}
 
   // Adds curve to intersectsWith unless it is there (a linear search).
   void SetIntersectsWith(int curve) {
@@ -116,7 +118,7 @@ class SegmentsT {
   void GenerateIntersections(const SegmentIntersectionSettings& settings, PairSearch search = PairSearch::Pruned);
 
   // Every record, segment after segment, each in list order, from the cursors
-  // (which are always at the start, so every record).
+  // (which are always at the start, so every record). O(s + r).
   std::vector<Intersection*> GetAllIntersections() const;
 
   // Removes a record and its twin and deletes both; unlinks an overlap they
@@ -128,6 +130,7 @@ class SegmentsT {
   void RemoveIntersections(int curve);
   // Removes every record whose enabled flag is false (with its twin) and
   // rebuilds intersectsWith and hasIntersections from the records that stay.
+  // O(r * l) for r records and lists of length l.
   void RemoveInvalidIntersections();
 
   // Points of the segment's first node, or null for a bad index or a curve

@@ -8,6 +8,10 @@
 // B''(t) = 6a t + 2b. Points are evaluated from the Bernstein form by de
 // Casteljau, which is exact at t = 0 and t = 1 and better conditioned than the
 // power basis; the power basis serves derivatives and polynomial set-ups.
+//
+// These are the inner building blocks: constexpr, allocation-free and
+// unchecked. Pointers must be valid; a non-finite coordinate propagates into
+// the result. Callers validate their input first (IsFinite below).
 #pragma once
 
 #include "ostracrv/core/common_types.h"
@@ -15,6 +19,7 @@
 
 namespace MavikMath::CubicBezier {
 
+// Four control points of either point kind, indexable like an array.
 template <class P>
 struct bezier2dT {
   P p[4];
@@ -24,6 +29,7 @@ struct bezier2dT {
   constexpr const P* data() const noexcept { return p; }
 };
 
+// B(t) = a t^3 + b t^2 + c t + d.
 struct PowerBasis {
   V a, b, c, d;
 };
@@ -64,7 +70,8 @@ constexpr D SecondDerivative(const V& a, const V& b, double t) noexcept {
 // B''' = 6a.
 constexpr D ThirdDerivative(const V& a) noexcept { return D{6.0 * a.x, 6.0 * a.y}; }
 
-// Whether all four points are finite.
+// Whether p is not null and all four points are finite (integer points
+// always are).
 template <class T>
 bool IsFinite(const T* p) noexcept {
   if constexpr (IsIntegerPoint<T>) {

@@ -58,7 +58,8 @@ double Length(const V& a, const V& b, const V& c, LengthAccuracy accuracy = kLen
 double LengthBetween(const V& a, const V& b, const V& c, double t0, double t1,
                      LengthAccuracy accuracy = kLengthPrecise) noexcept;
 
-// Arc length of the Bezier p[0..3] (widened to doubles).
+// Arc length of the Bezier p[0..3] (widened to doubles); 0 for a null
+// pointer or non-finite points.
 template <class T>
 double Length(const T* p, LengthAccuracy accuracy) noexcept;
 

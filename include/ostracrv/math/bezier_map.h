@@ -8,6 +8,13 @@
 // normal there. The normal is the left one ((-y, x) of the unit tangent, y
 // up), so that a y above the middle line stays on the left of the stroke's
 // direction of travel, as it was above the object's x axis.
+//
+// Method: the parameter at the fraction of the length is one arc-length
+// inversion (GetCurveRelativeLengthParameter, safeguarded Newton on the
+// Gauss-Legendre length of bezier_length.h), exact to the length accuracy
+// rather than a chord-length estimate, which drifts on uneven handles. The
+// direction there is SafeBezierTangent's (bezier_derivatives.h), so that a
+// handle lying on its end point still has a normal.
 #pragma once
 
 #include "ostracrv/math/vector2d.h"

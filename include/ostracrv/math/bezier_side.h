@@ -7,9 +7,10 @@
 // nearest point to the target: positive is left of the forward direction,
 // negative right, with the y axis up. Where the nearest point is an end, the
 // end tangent decides, so a target beyond an end is judged against the
-// tangent line extended. The direction is the derivative, or where that
-// vanishes (a handle lying on its end point, a cusp) the first non-vanishing
-// higher derivative with the sign of the direction of travel there.
+// tangent line extended. The direction is SafeBezierTangent's (see
+// bezier_derivatives.h): the derivative, or where that vanishes (a handle
+// lying on its end point, a cusp) the first non-vanishing higher derivative
+// with the sign of the direction of travel there.
 //
 // A target closer to the curve than 64 units in the last place of the
 // largest coordinate involved is on it: the side is SideNone.

@@ -6,7 +6,10 @@
 // input where stated, by computing into locals first.
 //
 // Parameters outside [0, 1] extrapolate (the construction still holds); a
-// NaN parameter yields NaN points, so callers check their parameters.
+// NaN parameter yields NaN points, so callers check their parameters. Nothing
+// is checked and nothing fails: pointers must be valid, and non-finite
+// points give non-finite pieces. Integer output is rounded half away from
+// zero, with the input's own end points copied exactly.
 #pragma once
 
 #include "ostracrv/core/common_types.h"

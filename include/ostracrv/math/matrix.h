@@ -47,7 +47,9 @@ enum class MapMode {
 // The matrix from the images of the axes and a translation.
 MATRIX ConstructMatrix(const D& xAxis, const D& yAxis, const D& translation) noexcept;
 // The matrix that maps from onto to. A source of zero width or height keeps
-// a scale of 1 on that axis so that the result stays invertible.
+// a scale of 1 on that axis so that the result stays invertible. An empty or
+// non-finite rectangle has no size to map: the result is then not finite,
+// so callers pass real rectangles.
 MATRIX ConstructRectTransformMatrix(const BoundsT<double>& from, const BoundsT<double>& to, MapMode mode) noexcept;
 
 }  // namespace MavikMath

@@ -23,7 +23,8 @@ inline constexpr int kMaxPolynomialDegree = 10;
 // polynomial yields 0. A double root is reported once.
 int SolveQuadratic(double a, double b, double c, double roots[2]) noexcept;
 
-// Value of the polynomial at x (Horner).
+// Value of the polynomial at x (Horner). Unchecked: coeffs must hold
+// degree + 1 values, degree >= 0.
 double EvaluatePolynomial(const double* coeffs, int degree, double x) noexcept;
 
 // All real roots in [lo, hi], ascending, deduplicated. roots must hold

@@ -76,7 +76,8 @@ bool IsPointInRect(const Framework::common_types::POINT& p, const Framework::com
 bool IsPointInRect(const V& p, const Framework::common_types::RECT& r) noexcept;
 bool IsPointInRect(const V& p, const BoundsT<double>& r) noexcept;
 
-// The centre, rounded half away from zero for the integer form.
+// The centre, rounded half away from zero for the integer form. An empty
+// rectangle has none: the result is then meaningless (NaN for BoundsT).
 Framework::common_types::POINT GetRectCenter(const Framework::common_types::RECT& r) noexcept;
 V GetRectCenter(const BoundsT<double>& b) noexcept;
 

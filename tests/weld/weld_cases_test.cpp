@@ -184,6 +184,26 @@ TEST(WeldCases, OpenResultAndFollowCurve) {
   EXPECT_GE(trimmed.GetPoint(0).x, 300.0);
 }
 
+// A loop whose kept edges do not come back to its start stays open, and
+// is counted, unless ForceClose closes it.
+TEST(WeldCases, ForceCloseClosesAnUnfinishedLoop) {
+  const PolycurveD square = Rect(0, 0, 100, 100);
+  for (WeldFlags f : {WeldFlags::None, WeldFlags::ForceClose}) {
+    WeldStateData s(square, false, PolycurveD(), false, false, false, f);
+    s.PerformWeld(&OstraCrv::UnionKeepRule);
+    Edge::First(s.segments.get(), 3).setEnabled(false);  // the closing side is not part of the result
+    const PolycurveD r = s.GenerateOutputCurve<V>(false);
+    EXPECT_EQ(s.UnclosedLoops(), 1);
+    ASSERT_TRUE(OstraCrv::IsValidCurve(r.GetNodeTypes(), r.GetPointCount()));
+    EXPECT_EQ(r.GetSubpaths().size(), 1u);
+    EXPECT_EQ(r.IsClosed(0), f == WeldFlags::ForceClose);
+    // The three sides left are drawn whatever the flag.
+    for (V p : {V{0, 0}, V{100, 0}, V{100, 100}, V{0, 100}}) EXPECT_TRUE(r.IsPointOnCurve(p, 1e-9));
+    // Forced, the gap is bridged by a line back to the start.
+    EXPECT_EQ(int(r.GetPointCount()), f == WeldFlags::ForceClose ? 5 : 4);
+  }
+}
+
 // The filled sides recorded on the graph.
 int SidesOfFirstEdge(WeldStateData& s, int segment) { return Edge::First(s.segments.get(), segment).sides(); }
 

@@ -39,6 +39,21 @@ struct Piece {
   NODETYPE n1, n2, endNode;
 };
 
+// Appends the kept pieces of a subpath after its start node; the closed
+// bits are the caller's to set.
+void Emit(std::vector<Piece> const& pieces, std::vector<V>& op, std::vector<NODETYPE>& on) {
+  for (Piece const& s : pieces) {
+    if (s.bezier) {
+      op.push_back(s.c1);
+      on.push_back(s.n1);
+      op.push_back(s.c2);
+      on.push_back(s.n2);
+    }
+    op.push_back(s.end);
+    on.push_back(NODETYPE(s.endNode & ~NodeMask::kClosed));
+  }
+}
+
 bool Folds(V const& a, V const& b, V const& c) {
   const D d1 = b - a, d2 = c - b;
   const double l = std::sqrt(Dot(d1, d1) * Dot(d2, d2));
@@ -109,16 +124,7 @@ PolycurveT<V> CleanWeldOperand(PolycurveT<V> const& c) {
     }
     op.push_back(start);
     on.push_back(startNode);
-    for (Piece const& s : pieces) {
-      if (s.bezier) {
-        op.push_back(s.c1);
-        on.push_back(s.n1);
-        op.push_back(s.c2);
-        on.push_back(s.n2);
-      }
-      op.push_back(s.end);
-      on.push_back(NODETYPE(s.endNode & ~NodeMask::kClosed));
-    }
+    Emit(pieces, op, on);
     // Closed bits: on the first node and on the last, which lies on it.
     if (closed && !pieces.empty()) {
       on.back() = NODETYPE((on.back() | NodeMask::kClosed) & ~NodeMask::kUser);
@@ -181,16 +187,7 @@ PolycurveT<V> CollapseShortSegments(PolycurveT<V> const& c, double distance) {
     if (closed && pieces.size() < 2) pieces.clear();
     op.push_back(start);
     on.push_back(nodes[i]);
-    for (Piece const& s : pieces) {
-      if (s.bezier) {
-        op.push_back(s.c1);
-        on.push_back(s.n1);
-        op.push_back(s.c2);
-        on.push_back(s.n2);
-      }
-      op.push_back(s.end);
-      on.push_back(NODETYPE(s.endNode & ~NodeMask::kClosed));
-    }
+    Emit(pieces, op, on);
     if (closed && !pieces.empty())
       on.back() = NODETYPE((on.back() | NodeMask::kClosed) & ~NodeMask::kUser);
     i = end;

@@ -25,15 +25,11 @@ using OstraCrv::PolycurveD;
 using Bytes = std::vector<NODETYPE>;
 
 using testgeo::NodesOf;
+using testgeo::Polyline;
 using testgeo::Valid;
 template <class C>
 double Area(const C& c) {
   return testgeo::ClockwiseArea(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
-}
-PolycurveD Polyline(std::initializer_list<V> pts) {
-  PolycurveD c;
-  for (const V& p : pts) c.IsEmpty() ? c.MoveTo(p) : c.LineTo(p);
-  return c;
 }
 
 TEST(Build, AppendsAndCollinearMerge) {

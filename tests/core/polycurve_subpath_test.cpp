@@ -20,14 +20,10 @@ using OstraCrv::PolycurveD;
 using Bytes = std::vector<NODETYPE>;
 
 using testgeo::NodesOf;
+using testgeo::RandomCurve;
 using testgeo::Valid;
 std::multiset<std::vector<double>> Segments(const PolycurveD& c) {
   return testgeo::SegmentSet(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
-}
-PolycurveD RandomCurve(std::mt19937& rng, testpaths::Path& path, int maxSubpaths = 4) {
-  path = testpaths::Make(rng, maxSubpaths, 5);
-  const auto pts = testgeo::PointsFor<V>(path, rng);
-  return PolycurveD(pts.data(), path.nodes.data(), path.nodes.size());
 }
 PolycurveD ClosedSquare() {
   PolycurveD sq;

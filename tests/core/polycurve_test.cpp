@@ -107,11 +107,7 @@ TYPED_TEST(PolycurveTyped, CopySharesUntilTheFirstWrite) {
   EXPECT_TRUE(a.IsSameData(b));
 
   EXPECT_TRUE(b.SetPoint(2, Pt<T>(99, 98)));
-  EXPECT_FALSE(a.IsSameData(b));
-  EXPECT_TRUE(Matches(a, m));
-  Model<T> m2 = m;
-  m2.pts[2] = Pt<T>(99, 98);
-  EXPECT_TRUE(Matches(b, m2));
+  EXPECT_FALSE(a.IsSameData(b));  // (what each side then holds: the random run)
 
   // The sole holder writes in place.
   const T* before = b.GetPoints();
@@ -259,15 +255,11 @@ TEST(PolycurveConversion, DoublesRoundHalfAwayFromZero) {
     EXPECT_EQ(i.GetPoint(k), want[k]) << k;
     EXPECT_EQ(i.GetNodeType(k), nodes[k]);
   }
-  // The raw cross-kind append rounds the same way and forks nothing for n = 0.
-  OstraCrv::Polycurve j = i, k2 = i;
+  // The raw cross-kind append (its rounding: the random run) forks nothing
+  // for n = 0.
+  OstraCrv::Polycurve k2 = i;
   EXPECT_TRUE(k2.PushBack(static_cast<const V*>(nullptr), nullptr, 0));
   EXPECT_TRUE(k2.IsSameData(i));
-  EXPECT_TRUE(j.PushBack(pts, nodes, 3));
-  ASSERT_EQ(j.GetPointCount(), 8u);
-  EXPECT_EQ(j.GetPoint(5), (POINT{3, -3}));
-  EXPECT_EQ(j.GetPoint(6), (POINT{2, -2}));
-  EXPECT_TRUE(Matches(i, Model<POINT>{{want, want + 5}, {nodes, nodes + 5}}));
 }
 
 TEST(PolycurveConversion, IntegersSurviveARoundTrip) {
@@ -284,10 +276,6 @@ TEST(PolycurveConversion, IntegersSurviveARoundTrip) {
   const OstraCrv::Polycurve back(d);
   EXPECT_TRUE(back == a);
   EXPECT_FALSE(back.IsSameData(a));
-
-  OstraCrv::PolycurveD e;
-  EXPECT_TRUE(e.PushBack(pts.data(), nodes.data(), 2));
-  EXPECT_EQ(e.GetPoint(1), (V{double(pts[1].x), double(pts[1].y)}));
 }
 
 // ---- Bad input ---------------------------------------------------------------

@@ -15,25 +15,16 @@ using OstraCrv::IsValidCurve;
 
 bool valid(const Nodes& v) { return IsValidCurve(v.data(), v.size()); }
 
-// The published bytes, spelled out so that the tests also pin their values.
+// The published bytes, spelled out.
 constexpr NODETYPE kMove = 0x04, kLine = 0x44, kCurve = 0x84, kArc = 0xC0, kCMove = 0x0C, kCLine = 0x48,
                    kCCurve = 0x88;
-
-// The closed triangle: four points, the last equal to the first.
-const Nodes kTriangle = {0x0C, 0x44, 0x44, 0x48};
-
-TEST(NodeTypeConstants, HaveThePublishedBytes) {
-  EXPECT_EQ((Nodes{NodeTypes::Open::move, NodeTypes::Open::line, NodeTypes::Open::curve, NodeTypes::arc,
-                   NodeTypes::Closed::move, NodeTypes::Closed::line, NodeTypes::Closed::curve, NodeTypes::Open::symmCurve}),
-            (Nodes{kMove, kLine, kCurve, kArc, kCMove, kCLine, kCCurve, 0xA4}));
-}
 
 TEST(NodeValidity, AcceptsLegalShapes) {
   EXPECT_TRUE(IsValidCurve(nullptr, 0));
   EXPECT_TRUE(valid({kMove}));
   EXPECT_TRUE(valid({kCMove}));            // a lone move, even closed
   EXPECT_TRUE(valid({kMove, kMove, kLine}));  // dangling move then a segment
-  EXPECT_TRUE(valid(kTriangle));
+  EXPECT_TRUE(valid({kCMove, kLine, kLine, kCLine}));  // the closed triangle
   EXPECT_TRUE(valid({kCMove, kArc, kArc, kCCurve}));
   EXPECT_TRUE(valid({kMove, kArc | 0x05, kArc | 0x01, kCurve}));  // picked arcs while enabled
   // Flags deliberately left to FixNodeTypes.
@@ -85,24 +76,6 @@ TEST(NodeValidity, RandomPathsAreValidAndMutationsAreCaught) {
   }
 }
 
-TEST(NodeRepair, TrailingArcBecomesLineOnce) {
-  Nodes v = {kMove, kLine, kArc | 0x01};
-  EXPECT_TRUE(FixNodeTypes(v.data(), v.size()));
-  EXPECT_EQ(v, (Nodes{kMove, kLine, kLine | 0x01}));
-  EXPECT_TRUE(valid(v));
-  EXPECT_FALSE(FixNodeTypes(v.data(), v.size()));
-}
-
-TEST(NodeRepair, ClosedEndsAndInteriorFlags) {
-  Nodes v = {kCMove, 0x4C, 0x40, 0x4C};  // stray closed inside, missing user, user on the closing end
-  EXPECT_TRUE(FixNodeTypes(v.data(), v.size()));
-  EXPECT_EQ(v, (Nodes{kCMove, kLine, kLine, kCLine}));
-  // The move's closed bit decides; it is never changed itself.
-  v = {kMove, kLine, kCLine};
-  EXPECT_TRUE(FixNodeTypes(v.data(), v.size()));
-  EXPECT_EQ(v, (Nodes{kMove, kLine, kLine}));
-}
-
 // Scrambling the flags that FixNodeTypes owns and repairing gives back the
 // original path; the change report is exact and a second run changes nothing.
 TEST(NodeRepair, RestoresScrambledFlagsOfRandomPaths) {
@@ -128,21 +101,6 @@ TEST(NodeRepair, RestoresScrambledFlagsOfRandomPaths) {
     EXPECT_EQ(v, p.nodes);
     EXPECT_FALSE(FixNodeTypes(v.data(), v.size()));
   }
-}
-
-TEST(NodeWalk, ClosedTriangle) {
-  const NODETYPE* t = kTriangle.data();
-  EXPECT_EQ(NN(t, 3, 4), 1);
-  EXPECT_EQ(NN(t, 0, 4), 1);
-  EXPECT_EQ(PN(t, 1, 4), 3);
-  EXPECT_EQ(PN(t, 0, 4), 3);
-  EXPECT_EQ(PN(t, 3, 4), 2);
-  EXPECT_EQ(OtherClosedEnd(t, 0, 4), 3);
-  EXPECT_EQ(OtherClosedEnd(t, 3, 4), 0);
-  EXPECT_EQ(OtherClosedEnd(t, 1, 4), -1);
-  EXPECT_EQ(CRV_GetUserNode(t, 4, 3), 0);
-  EXPECT_EQ(CRV_GetNumberOfUserNodes(t, 4, false), 3);
-  EXPECT_EQ(OstraCrv::GetSegmentCount(t, 4), 3);
 }
 
 // NN walks each closed ring f+1..l and returns to its start; PN walks it

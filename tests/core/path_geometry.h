@@ -1,8 +1,9 @@
 // Independent geometry of raw paths for tests: Bezier points straight from
 // the Bernstein polynomials, fine flattenings, shoelace areas and lengths,
 // radial errors against an ellipse, and points for the random node arrays of
-// random_paths.h. Nothing here calls
-// the library's geometry, so that tests compare against a second method.
+// random_paths.h. Nothing here calls the library's geometry, so that tests
+// compare against a second method; only the curve makers at the end build
+// curves through the library's plain appends.
 #pragma once
 
 #include <algorithm>
@@ -15,6 +16,7 @@
 #include "core/random_paths.h"
 #include "ostracrv/core/nodetype.h"
 #include "ostracrv/math/vector2d.h"
+#include "polycurve.h"
 
 namespace testgeo {
 
@@ -163,6 +165,23 @@ std::vector<T> PointsFor(const testpaths::Path& path, std::mt19937& rng, double 
   for (const auto& sp : path.subpaths)
     if (sp.closed) pts[sp.last] = pts[sp.first];
   return pts;
+}
+
+// ---- Curve makers for the tests.
+
+// An open polyline through the points.
+inline OstraCrv::PolycurveD Polyline(std::initializer_list<V> pts) {
+  OstraCrv::PolycurveD c;
+  for (const V& p : pts) c.IsEmpty() ? c.MoveTo(p) : c.LineTo(p);
+  return c;
+}
+
+// A random valid curve, with the record of how it was built in path.
+inline OstraCrv::PolycurveD RandomCurve(std::mt19937& rng, testpaths::Path& path, int maxSubpaths = 4,
+                                        double range = 1000.0) {
+  path = testpaths::Make(rng, maxSubpaths, 5);
+  const auto pts = PointsFor<V>(path, rng, range);
+  return OstraCrv::PolycurveD(pts.data(), path.nodes.data(), path.nodes.size());
 }
 
 }  // namespace testgeo

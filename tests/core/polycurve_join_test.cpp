@@ -15,19 +15,11 @@ using Framework::common_types::POINT;
 using MavikMath::V;
 using OstraCrv::PolycurveD;
 
-template <class C>
-bool Valid(const C& c) {
-  return OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount());
-}
-PolycurveD Polyline(std::vector<V> pts) {
-  PolycurveD c;
-  for (const V& p : pts) c.IsEmpty() ? c.MoveTo(p) : c.LineTo(p);
-  return c;
-}
+using testgeo::Polyline;
+using testgeo::Valid;
 PolycurveD RandomCurve(std::mt19937& rng) {
-  const testpaths::Path path = testpaths::Make(rng, 4, 5);
-  const auto pts = testgeo::PointsFor<V>(path, rng, 100.0);
-  return PolycurveD(pts.data(), path.nodes.data(), path.nodes.size());
+  testpaths::Path path;
+  return testgeo::RandomCurve(rng, path, 4, 100.0);
 }
 
 TEST(JoinEndpoints, WeldsTheLastEndToTheNearestOpenEnd) {

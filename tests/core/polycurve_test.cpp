@@ -107,11 +107,7 @@ TYPED_TEST(PolycurveTyped, CopySharesUntilTheFirstWrite) {
   EXPECT_TRUE(a.IsSameData(b));
 
   EXPECT_TRUE(b.SetPoint(2, Pt<T>(99, 98)));
-  EXPECT_FALSE(a.IsSameData(b));
-  EXPECT_TRUE(Matches(a, m));
-  Model<T> m2 = m;
-  m2.pts[2] = Pt<T>(99, 98);
-  EXPECT_TRUE(Matches(b, m2));
+  EXPECT_FALSE(a.IsSameData(b));  // (what each side then holds: the random run)
 
   // The sole holder writes in place.
   const T* before = b.GetPoints();
@@ -126,33 +122,9 @@ TYPED_TEST(PolycurveTyped, CopySharesUntilTheFirstWrite) {
   EXPECT_TRUE(Matches(b, m));
 }
 
-TYPED_TEST(PolycurveTyped, MoveFormsLeaveTheSourceAsSpecified) {
-  using T = TypeParam;
-  const Model<T> ma = Line<T>(4), mb = Line<T>(2, 100);
-  PolycurveT<T> a = Make(ma), b = Make(mb);
-
-  // Move assignment swaps: the source gets the target's old content.
-  a = std::move(b);
-  EXPECT_TRUE(Matches(a, mb));
-  EXPECT_TRUE(Matches(b, ma));  // NOLINT(bugprone-use-after-move)
-
-  // The move constructor leaves the source a valid empty curve, which can be
-  // written again.
-  PolycurveT<T> c(std::move(a));
-  EXPECT_TRUE(Matches(c, mb));
-  EXPECT_TRUE(a.IsEmpty());  // NOLINT(bugprone-use-after-move)
-  EXPECT_FALSE(a.IsSameData(c));
-  a.PushBack(Pt<T>(3, 4), NodeTypes::Open::move);
-  EXPECT_EQ(a.GetPointCount(), 1u);
-
-  c.Swap(b);
-  EXPECT_TRUE(Matches(c, ma));
-  EXPECT_TRUE(Matches(b, mb));
-}
-
 // ---- Borrowed arrays -------------------------------------------------------
 
-TYPED_TEST(PolycurveTyped, ReferenceNeverWritesTheCallersArrays) {
+TYPED_TEST(PolycurveTyped, ReferenceBorrowsUntilOwnershipIsTaken) {
   using T = TypeParam;
   Model<T> caller = Line<T>(6);
   caller.nodes[5] = NodeTypes::Open::line | NodeMask::kLetter;
@@ -163,21 +135,8 @@ TYPED_TEST(PolycurveTyped, ReferenceNeverWritesTheCallersArrays) {
   EXPECT_EQ(r.GetPoints(), caller.pts.data());
   EXPECT_EQ(r.Compare(Make(caller)), 0);
 
-  PolycurveT<T> shared(r);
-  PolycurveT<T> other(r);
-  r.SetPoint(0, Pt<T>(-7, -7));
-  r.SetContinuity(3, ContinuityType::symm);
-  r.ClearLetterFlags();
-  shared.PushBack(Pt<T>(1, 2), NodeTypes::Open::line);
-  other.GetBufferSetCount(2).points[1] = Pt<T>(5, 5);
-  other.ReleaseBufferInternal(1);
-
-  EXPECT_TRUE(BytesEqual(caller.pts.data(), snapshot.pts.data(), 6));
-  EXPECT_EQ(caller.nodes, snapshot.nodes);
-  EXPECT_NE(r.GetPoints(), caller.pts.data());
-  EXPECT_EQ(r.GetNodeType(3), WithContinuity(NodeTypes::Open::line, ContinuityType::symm));
-  EXPECT_EQ(shared.GetPointCount(), 7u);
-  EXPECT_EQ(other.GetPointCount(), 1u);
+  // (That writes through a view never reach the caller is checked by the
+  // random run.)
 
   // Taking ownership copies borrowed arrays: later changes by the caller are
   // not seen.
@@ -209,66 +168,6 @@ TYPED_TEST(PolycurveTyped, AppendingToAnEmptyCurveShares) {
   EXPECT_FALSE(e2.IsSameData(view));
   EXPECT_NE(e2.GetPoints(), m.pts.data());
   EXPECT_TRUE(Matches(e2, m));
-
-  // Appending a curve to itself doubles it.
-  PolycurveT<T> self = Make(m);
-  self.PushBack(self);
-  Model<T> twice = m;
-  twice.pts.insert(twice.pts.end(), m.pts.begin(), m.pts.end());
-  twice.nodes.insert(twice.nodes.end(), m.nodes.begin(), m.nodes.end());
-  EXPECT_TRUE(Matches(self, twice));
-}
-
-// ---- Buffer protocol -------------------------------------------------------
-
-TYPED_TEST(PolycurveTyped, BufferRoundTrips) {
-  using T = TypeParam;
-  const Model<T> m = Line<T>(4);
-  PolycurveT<T> a = Make(m);
-  PolycurveT<T> b(a);
-
-  // Growing shared storage: prefix kept, new entries zero, the other handle
-  // untouched.
-  auto buf = b.GetBuffer(10);
-  ASSERT_EQ(buf.count, 10);
-  EXPECT_TRUE(BytesEqual(buf.points, m.pts.data(), 4));
-  EXPECT_TRUE(BytesEqual(buf.nodes, m.nodes.data(), 4));
-  const T zero{};
-  for (int i = 4; i < 10; ++i) {
-    EXPECT_TRUE(BytesEqual(&buf.points[i], &zero, 1));
-    EXPECT_EQ(buf.nodes[i], 0);
-  }
-  EXPECT_TRUE(Matches(a, m));
-
-  // Edit in place with a flat function, then give the count back.
-  buf.points[4] = Pt<T>(40, 40);
-  buf.nodes[4] = NodeTypes::Open::line;
-  CRV_SetCont(buf.nodes, 5, 2, ContinuityType::smooth);
-  EXPECT_TRUE(b.ReleaseBufferInternal(5));
-  Model<T> expect = m;
-  expect.pts.push_back(Pt<T>(40, 40));
-  expect.nodes.push_back(NodeTypes::Open::line);
-  expect.nodes[2] = WithContinuity(expect.nodes[2], ContinuityType::smooth);
-  EXPECT_TRUE(Matches(b, expect));
-
-  // "At least" never shrinks; "exactly" does; release never grows.
-  EXPECT_EQ(b.GetBuffer(2).count, 5);
-  EXPECT_EQ(b.GetBuffer().count, 5);
-  b.ReleaseBuffer(50);
-  EXPECT_EQ(b.GetPointCount(), 5u);
-  EXPECT_EQ(b.GetBufferSetCount(3).count, 3);
-  EXPECT_EQ(b.GetPointCount(), 3u);
-  EXPECT_FALSE(b.ReleaseBufferInternal(-1));
-  EXPECT_EQ(b.GetPointCount(), 3u);
-  EXPECT_EQ(b.GetBuffer(-4).count, 3);
-  b.ReleaseBuffer();
-  EXPECT_TRUE(BytesEqual(b.GetPoints(), m.pts.data(), 3));
-
-  // A buffer of a borrowed view is a private copy.
-  PolycurveRefT<T> view(m.pts.data(), m.nodes.data(), 4);
-  auto vb = view.GetBuffer();
-  EXPECT_NE(vb.points, m.pts.data());
-  EXPECT_EQ(vb.count, 4);
 }
 
 TYPED_TEST(PolycurveTyped, ImpossibleRequestsThrowAndLeaveTheCurve) {
@@ -286,23 +185,16 @@ TYPED_TEST(PolycurveTyped, ImpossibleRequestsThrowAndLeaveTheCurve) {
 
 // ---- Ordering --------------------------------------------------------------
 
-TYPED_TEST(PolycurveTyped, CompareOrdersByCountFirst) {
+// (Compare itself is checked against the model by the random run.)
+TYPED_TEST(PolycurveTyped, OperatorsFollowCompare) {
   using T = TypeParam;
   const PolycurveT<T> small = Make(Line<T>(2, 1000)), big = Make(Line<T>(3, -1000));
-  EXPECT_EQ(small.Compare(big), -1);
-  EXPECT_EQ(big.Compare(small), 1);
   EXPECT_TRUE(small < big);
   EXPECT_FALSE(big < small);
-  EXPECT_EQ(PolycurveT<T>().Compare(PolycurveT<T>()), 0);
-
-  // Equal content in separate storage is equal; nodes break ties of points.
-  Model<T> m = Line<T>(3);
-  PolycurveT<T> x = Make(m), y = Make(m);
+  PolycurveT<T> x = Make(Line<T>(3)), y = Make(Line<T>(3));
   EXPECT_TRUE(x == y);
   y.SetNodeType(2, NodeTypes::Open::curve);
   EXPECT_FALSE(x == y);
-  EXPECT_EQ(x.Compare(y), -y.Compare(x));
-  EXPECT_NE(x.Compare(y), 0);
 
   // Sorting a mixed set puts them in order of count.
   std::vector<PolycurveT<T>> all;
@@ -363,15 +255,11 @@ TEST(PolycurveConversion, DoublesRoundHalfAwayFromZero) {
     EXPECT_EQ(i.GetPoint(k), want[k]) << k;
     EXPECT_EQ(i.GetNodeType(k), nodes[k]);
   }
-  // The raw cross-kind append rounds the same way and forks nothing for n = 0.
-  OstraCrv::Polycurve j = i, k2 = i;
+  // The raw cross-kind append (its rounding: the random run) forks nothing
+  // for n = 0.
+  OstraCrv::Polycurve k2 = i;
   EXPECT_TRUE(k2.PushBack(static_cast<const V*>(nullptr), nullptr, 0));
   EXPECT_TRUE(k2.IsSameData(i));
-  EXPECT_TRUE(j.PushBack(pts, nodes, 3));
-  ASSERT_EQ(j.GetPointCount(), 8u);
-  EXPECT_EQ(j.GetPoint(5), (POINT{3, -3}));
-  EXPECT_EQ(j.GetPoint(6), (POINT{2, -2}));
-  EXPECT_TRUE(Matches(i, Model<POINT>{{want, want + 5}, {nodes, nodes + 5}}));
 }
 
 TEST(PolycurveConversion, IntegersSurviveARoundTrip) {
@@ -388,10 +276,6 @@ TEST(PolycurveConversion, IntegersSurviveARoundTrip) {
   const OstraCrv::Polycurve back(d);
   EXPECT_TRUE(back == a);
   EXPECT_FALSE(back.IsSameData(a));
-
-  OstraCrv::PolycurveD e;
-  EXPECT_TRUE(e.PushBack(pts.data(), nodes.data(), 2));
-  EXPECT_EQ(e.GetPoint(1), (V{double(pts[1].x), double(pts[1].y)}));
 }
 
 // ---- Bad input ---------------------------------------------------------------

@@ -90,4 +90,11 @@ inline std::vector<int> OpenEnds(const testpaths::Path& path) {
   return e;
 }
 
+// Lone moves of a path record: the tidy-up after an edit removes them
+// unless the path is a text.
+inline int Stray(const testpaths::Path& path) {
+  return int(std::count_if(path.subpaths.begin(), path.subpaths.end(),
+                           [](const testpaths::Subpath& s) { return s.first == s.last; }));
+}
+
 }  // namespace testedit

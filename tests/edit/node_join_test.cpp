@@ -11,11 +11,7 @@ using Framework::common_types::POINT;
 using MavikMath::V;
 using testedit::Raw;
 
-// Moves the tidy-up removes: stray moves (the paths here are no texts).
-int Stray(const testpaths::Path& path) {
-  return int(std::count_if(path.subpaths.begin(), path.subpaths.end(),
-                           [](const testpaths::Subpath& s) { return s.first == s.last; }));
-}
+using testedit::Stray;  // the paths here are no texts
 
 // Two open ends of different subpaths, or -1s.
 std::pair<int, int> TwoEnds(std::mt19937& rng, const testpaths::Path& path, bool sameSubpath) {

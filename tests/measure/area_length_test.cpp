@@ -1,11 +1,12 @@
 // Area and length against fine flattenings of random paths (shoelace sum and
-// polyline length), against circles, and pinned readings of signs and lengths.
+// polyline length, which also pin the clockwise-positive sign), against
+// circles, and pinned readings of signs and lengths.
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <numbers>
 
-#include "measure/sampled_paths.h"
+#include "measure/inshape_reference.h"
 
 namespace {
 
@@ -46,22 +47,6 @@ TYPED_TEST(AreaLength, AgreeWithFineFlattening) {
   }
 }
 
-// A clockwise rectangle (y up) in the corner order of a RECT and of bounds.
-template <class T>
-PolycurveT<T> Rectangle(double l, double b, double r, double t) {
-  auto P = [](double x, double y) { return MavikMath::FromV<T>(V{x, y}); };
-  const T pts[] = {P(l, b), P(l, t), P(r, t), P(r, b), P(l, b)};
-  const NODETYPE nodes[] = {NodeTypes::Closed::move, NodeTypes::Open::line, NodeTypes::Open::line,
-                            NodeTypes::Open::line, NodeTypes::Closed::line};
-  return PolycurveT<T>(pts, nodes, 5);
-}
-
-TEST(AreaSigns, RectangleIsPositiveInBothKinds) {
-  const double a = Rectangle<POINT>(-3, -2, 7, 5).GetArea();
-  EXPECT_DOUBLE_EQ(a, 70.0);
-  EXPECT_DOUBLE_EQ(Rectangle<V>(-3, -2, 7, 5).GetArea(), a);
-}
-
 TYPED_TEST(AreaLength, OpenSubpathsDoNotCount) {
   using T = TypeParam;
   const T tri[] = {T{0, 0}, T{0, 4}, T{3, 0}, T{0, 0}};
@@ -96,27 +81,12 @@ TEST(AreaLengthBadInput, NaNGivesZeroNotNaN) {
   EXPECT_EQ(OstraCrv::GetLengthAlongCurveTo(pts, nodes, 4, 3, nan), 0.0);
 }
 
-// Four Bezier quarters with the usual handle factor, counter-clockwise.
-template <class T>
-PolycurveT<T> Circle(double r) {
-  const double k = 0.5522847498 * r;
-  auto P = [](double x, double y) { return MavikMath::FromV<T>(V{x, y}); };
-  const T pts[] = {P(r, 0),   P(r, k),   P(k, r),  P(0, r),  P(-k, r), P(-r, k), P(-r, 0),
-                   P(-r, -k), P(-k, -r), P(0, -r), P(k, -r), P(r, -k), P(r, 0)};
-  std::vector<NODETYPE> nodes = {WithContinuity(NodeTypes::Closed::move, ContinuityType::smooth)};
-  for (int q = 0; q < 4; ++q) {
-    nodes.push_back(NodeTypes::arc);
-    nodes.push_back(NodeTypes::arc);
-    nodes.push_back(q == 3 ? NodeTypes::Closed::smoothCurve : NodeTypes::Open::smoothCurve);
-  }
-  return PolycurveT<T>(pts, nodes.data(), 13);
-}
-
 TYPED_TEST(AreaLength, CircleMatchesWithinTheFourArcError) {
   using T = TypeParam;
   const double r = 1000.0, pi = std::numbers::pi;
-  const auto c = Circle<T>(r);
-  ASSERT_TRUE(OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount()));
+  inref::Builder<T> b;  // four Bezier quarters with the usual handle factor
+  b.Circle({0, 0}, r, false);
+  const PolycurveT<T> c(b.points.data(), b.nodes.data(), b.n());
   EXPECT_NEAR(c.GetArea(), -pi * r * r, 1e-3 * pi * r * r);  // counter-clockwise: negative
   EXPECT_NEAR(c.GetLength(), 2 * pi * r, 1e-3 * r);
   // A quarter arc alone.

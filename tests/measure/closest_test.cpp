@@ -6,7 +6,7 @@
 #include <cfloat>
 #include <cmath>
 
-#include "measure/sampled_paths.h"
+#include "measure/inshape_reference.h"
 
 namespace {
 
@@ -182,13 +182,11 @@ TYPED_TEST(Closest, LinesCornersAndEnds) {
 
 TYPED_TEST(Closest, CircleCentreHasSortedMinima) {
   using T = TypeParam;
-  const double r = 1000, k = 0.5522847498 * r;
-  auto P = [](double x, double y) { return MavikMath::FromV<T>(V{x, y}); };
-  const T pts[] = {P(r, 0), P(r, k), P(k, r), P(0, r), P(-k, r), P(-r, k), P(-r, 0)};
-  const NODETYPE nodes[] = {NodeTypes::Open::move, NodeTypes::arc, NodeTypes::arc,        NodeTypes::Open::smoothCurve,
-                            NodeTypes::arc,        NodeTypes::arc, NodeTypes::Open::curve};
+  const double r = 1000;
+  inref::Builder<T> b;
+  b.Circle({0, 0}, r, false);
   std::vector<ClosestPoint<T, CurvePosition>> all;
-  ASSERT_TRUE(OstraCrv::FindClosestPoints(pts, nodes, 7, T{0, 0}, all));
+  ASSERT_TRUE(OstraCrv::FindClosestPoints(b.points.data(), b.nodes.data(), b.n(), T{0, 0}, all));
   EXPECT_GE(all.size(), 2u);
   EXPECT_TRUE(std::is_sorted(all.begin(), all.end()));
   for (const auto& c : all) EXPECT_NEAR(std::sqrt(c.distanceSquared), r, 0.001 * r);

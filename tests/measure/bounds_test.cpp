@@ -64,6 +64,14 @@ TYPED_TEST(Bounds, TightBoxMatchesSampling) {
     const RECT loose = p.curve.GetLooseBBox();
     EXPECT_TRUE(loose.left == int(std::floor(all.left)) && loose.right == int(std::ceil(all.right)) &&
                 loose.bottom == int(std::floor(all.bottom)) && loose.top == int(std::ceil(all.top)));
+    if constexpr (std::is_same_v<T, V>) {
+      // Off the grid, the double path's box rounds outward on every side.
+      PolycurveT<V> moved = p.curve;
+      moved += MavikMath::D{0.37, -0.61};
+      const RECT m = moved.GetLooseBBox();
+      EXPECT_TRUE(m.left == int(std::floor(all.left + 0.37)) && m.right == int(std::ceil(all.right + 0.37)) &&
+                  m.bottom == int(std::floor(all.bottom - 0.61)) && m.top == int(std::ceil(all.top - 0.61)));
+    }
     // Under a rotation the box is tight in the rotated frame.
     const BoundsT<double> rs = SampledBox(p, rot, 20000);
     const BoundsT<double> t = p.curve.GetTightTransformedBBox(rot);

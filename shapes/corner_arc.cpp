@@ -20,8 +20,8 @@
 #include "ostracrv/shapes/corner_arc.h"
 
 #include <cmath>
-#include <numbers>
 
+#include "arc_common.h"
 #include "ostracrv/shapes/curve_append.h"
 
 namespace OstraCrv {
@@ -31,23 +31,14 @@ using MavikMath::V;
 
 namespace {
 
-constexpr double kEps = MavikMath::kEpsilon;
-constexpr double kHalfPi = std::numbers::pi / 2.0;
+using namespace arc_internal;
+
 // Cosine below which a corner arc is split into two Beziers.
 constexpr double kTwoPieceCosine = -0.001;
 // Cosine at or above which a fillet arc is too straight to draw.
 constexpr double kFilletStraightCosine = 0.9999;
 // A fillet chord passing closer than this to the centre has no usable middle.
 constexpr double kFilletMinMidDistance = 5.0;
-
-// The unit left normal of u scaled to h, or (h, u.x) for a u too short to
-// have a direction.
-D NormalHandle(const D& u, double h) noexcept {
-  const double l2 = u.SquaredLength();
-  if (!(l2 > kEps)) return D{h, u.x};
-  const double l = std::sqrt(l2);
-  return D{-u.y / l * h, u.x / l * h};
-}
 
 // Cosine of the angle at center between a and b; NaN for a degenerate or
 // non-finite pair. P is |a - center|^2 |b - center|^2.
@@ -66,7 +57,7 @@ int GetArcSegmentHandles(V* handles, const V& center, const V& a, const V& b) {
   const double s = std::sqrt(1.0 - c * c);
   const double angle = kHalfPi - std::atan2(c, s);
   const double h = r * angle * kCornerArcHandle / kHalfPi;
-  const D p = NormalHandle(u, h), q = NormalHandle(v, h);
+  const D p = ScaledLeftNormal(u, h), q = ScaledLeftNormal(v, h);
   if (MavikMath::Dot(b - a, p) < 0.0) {
     handles[0] = a - p;
     handles[1] = b + q;

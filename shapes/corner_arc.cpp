@@ -68,6 +68,19 @@ int GetArcSegmentHandles(V* handles, const V& center, const V& a, const V& b) {
   return 1;
 }
 
+namespace {
+
+// A wide corner arc as two Beziers meeting at m, the arc's middle: writes the
+// handles of both and m in between (h0, h1, m, h2, h3); 0 when either piece
+// has none.
+int SplitArcHandles(V* out, const V& center, const V& a, const V& m, const V& b) {
+  out[2] = m;
+  const int ok = GetArcSegmentHandles(out, center, a, m);
+  return ok ? GetArcSegmentHandles(out + 3, center, m, b) : ok;
+}
+
+}  // namespace
+
 int BuildCircularArc(const V& center, const D& direction, const V& a, const V& b, double radius, V* out,
                      int& count) {
   if (!out) return 0;
@@ -78,11 +91,8 @@ int BuildCircularArc(const V& center, const D& direction, const V& a, const V& b
     if (c < kTwoPieceCosine) {
       D dir = direction;
       const V m = dir.Normalize() ? center + dir * radius : center + D{radius, direction.y};
-      out[2] = m;
-      int ok = GetArcSegmentHandles(out, center, a, m);
-      if (ok) ok = GetArcSegmentHandles(out + 3, center, m, b);
       count = 5;
-      return ok;
+      return SplitArcHandles(out, center, a, m, b);
     }
     if (!(c < 1.0)) return 0;
   }
@@ -103,11 +113,8 @@ int BuildCircularArc(const V& center, const V& a, const V& b, double radius, V* 
       if (!(toMid.Length() >= kFilletMinMidDistance)) return 0;
       toMid.Normalize();
       const V m = center + toMid * radius;
-      out[2] = m;
-      int ok = GetArcSegmentHandles(out, center, a, m);
-      if (ok) ok = GetArcSegmentHandles(out + 3, center, m, b);
       count = 5;
-      return ok;
+      return SplitArcHandles(out, center, a, m, b);
     }
     if (!(c < kFilletStraightCosine)) return 0;
   }

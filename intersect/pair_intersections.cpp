@@ -281,33 +281,35 @@ T const* OwnPoints(T const* curvePoints, const SegmentsT<T>& segments, int segme
   return curvePoints + segments.segments[segment].firstNode;
 }
 
+// Runs a pair given by its curves' arrays; nothing when either segment has
+// no points there.
+template <class T>
+void RunOwnPair(PairKind kind, T const* firstPoints, T const* secondPoints, int first, int second,
+                SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
+  T const* a = OwnPoints(firstPoints, segments, first);
+  T const* b = OwnPoints(secondPoints, segments, second);
+  if (!a || !b) return;
+  RunPair(kind, a, b, first, second, segments, joint, settings);
+}
+
 }  // namespace
 
 template <class T>
 void AddLineIntersections(T const* firstPoints, T const* secondPoints, int first, int second, SegmentsT<T>& segments,
                           JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(firstPoints, segments, first);
-  T const* b = OwnPoints(secondPoints, segments, second);
-  if (!a || !b) return;
-  RunPair(PairKind::Lines, a, b, first, second, segments, joint, settings);
+  RunOwnPair(PairKind::Lines, firstPoints, secondPoints, first, second, segments, joint, settings);
 }
 
 template <class T>
 void AddLineBezierIntersections(T const* linePoints, T const* bezierPoints, int line, int bezier,
                                 SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(linePoints, segments, line);
-  T const* b = OwnPoints(bezierPoints, segments, bezier);
-  if (!a || !b) return;
-  RunPair(PairKind::LineBezier, a, b, line, bezier, segments, joint, settings);
+  RunOwnPair(PairKind::LineBezier, linePoints, bezierPoints, line, bezier, segments, joint, settings);
 }
 
 template <class T>
 void AddBezierIntersections(T const* firstPoints, T const* secondPoints, int first, int second,
                             SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(firstPoints, segments, first);
-  T const* b = OwnPoints(secondPoints, segments, second);
-  if (!a || !b) return;
-  RunPair(PairKind::Beziers, a, b, first, second, segments, joint, settings);
+  RunOwnPair(PairKind::Beziers, firstPoints, secondPoints, first, second, segments, joint, settings);
 }
 
 template <class T>

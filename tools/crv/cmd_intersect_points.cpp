@@ -81,10 +81,7 @@ bool ParseNumber(const std::string& text, double& v) {
 int RunIntersectPoints(const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output", "--tolerance", "--precision"}, {}, message))
+  if (!args.Parse(WithLongOutput(argv), {"--output", "--tolerance", "--precision"}, {}, message))
     return UsageError("intersect-points", message);
   if (args.help) {
     std::cout << kIntersectPointsHelp;

@@ -125,11 +125,7 @@ bool RunConverter(const std::string& program, const std::string& in, const std::
 int RunRender(const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  // -o is the short form of --output.
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output"}, {"--png"}, message)) return UsageError("render", message);
+  if (!args.Parse(WithLongOutput(argv), {"--output"}, {"--png"}, message)) return UsageError("render", message);
   if (args.help) {
     std::cout << kRenderHelp;
     return kOk;

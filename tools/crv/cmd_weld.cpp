@@ -72,10 +72,7 @@ Operand MakeOperand(const svgdoc::Document& doc, int rule, WeldFlags flags) {
 int RunWeld(const std::string& command, const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output"}, {"--nonzero", "--evenodd", "--precise"}, message))
+  if (!args.Parse(WithLongOutput(argv), {"--output"}, {"--nonzero", "--evenodd", "--precise"}, message))
     return UsageError(command, message);
   if (args.help) {
     std::cout << kWeldHelp;

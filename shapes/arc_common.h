@@ -10,10 +10,16 @@
 #include <cmath>
 #include <numbers>
 
+#include "ostracrv/core/common_types.h"
 #include "ostracrv/math/vector2d.h"
 
 namespace OstraCrv::arc_internal {
 
+using Framework::common_types::POINT;
+using MavikMath::D;
+using MavikMath::V;
+
+inline constexpr double kEps = MavikMath::kEpsilon;
 inline constexpr double kHalfPi = std::numbers::pi / 2.0;
 inline constexpr double kTwoPi = 2.0 * std::numbers::pi;
 
@@ -26,11 +32,11 @@ inline double CircleHandleLength(double r, double half) noexcept {
 
 // The unit left normal of u scaled to h, or (h, u.x) for a u too short to
 // have a direction (a squared length not above kEpsilon, or NaN).
-inline MavikMath::D ScaledLeftNormal(const MavikMath::D& u, double h) noexcept {
+inline D ScaledLeftNormal(const D& u, double h) noexcept {
   const double l2 = u.SquaredLength();
-  if (!(l2 > MavikMath::kEpsilon)) return MavikMath::D{h, u.x};
+  if (!(l2 > kEps)) return D{h, u.x};
   const double l = std::sqrt(l2);
-  return MavikMath::D{-u.y / l * h, u.x / l * h};
+  return D{-u.y / l * h, u.x / l * h};
 }
 
 }  // namespace OstraCrv::arc_internal

@@ -34,15 +34,10 @@
 
 namespace OstraCrv {
 
-using Framework::common_types::POINT;
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
 
-using namespace arc_internal;
-
-constexpr double kEps = MavikMath::kEpsilon;
 // A sweep this close to a whole number of quadrants gets no sliver piece.
 constexpr double kQuadrantTolerance = 1e-5;
 constexpr int kMaxPieces = 4;

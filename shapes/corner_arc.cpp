@@ -26,12 +26,9 @@
 
 namespace OstraCrv {
 
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
-
-using namespace arc_internal;
 
 // Cosine below which a corner arc is split into two Beziers.
 constexpr double kTwoPieceCosine = -0.001;

@@ -29,15 +29,10 @@
 
 namespace OstraCrv {
 
-using Framework::common_types::POINT;
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
 
-using namespace arc_internal;
-
-constexpr double kEps = MavikMath::kEpsilon;
 // Five pieces, 3 points each, the first point, and two centre points of a pie.
 constexpr int kLocalPoints = 18;
 constexpr int kMaxPieces = 5;

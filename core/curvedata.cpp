@@ -28,6 +28,18 @@ bool PointsInto(const E* p, const std::vector<E>& v) noexcept {
   return le(v.data(), p) && lt(p, v.data() + v.capacity());
 }
 
+// The MoveData of storage that must not be written in place: hands the
+// caller's vectors to a new CurveData (leaving them empty) and lets go of the
+// caller's reference to old. Throws std::bad_alloc with nothing changed.
+template <class T>
+CurveDataBase<T>* MoveIntoFresh(CurveDataBase<T>* old, std::vector<T>& p, std::vector<NODETYPE>& n) {
+  auto* fresh = new CurveData<T>(std::move(p), std::move(n));
+  p.clear();
+  n.clear();
+  CurveDataBase<T>::Release(old);
+  return fresh;
+}
+
 }  // namespace
 
 // ---- CurveDataBase ---------------------------------------------------------
@@ -70,11 +82,7 @@ CurveDataBase<T>* CurveData<T>::MoveData(std::vector<T>& p, std::vector<NODETYPE
     nodes.swap(n);
     return this;
   }
-  auto* fresh = new CurveData<T>(std::move(p), std::move(n));
-  p.clear();
-  n.clear();
-  CurveDataBase<T>::Release(this);
-  return fresh;
+  return MoveIntoFresh(this, p, n);
 }
 
 template <class T>
@@ -186,11 +194,7 @@ CurveDataBase<T>* CurveDataRef<T>::Fork() {
 
 template <class T>
 CurveDataBase<T>* CurveDataRef<T>::MoveData(std::vector<T>& p, std::vector<NODETYPE>& n) {
-  auto* fresh = new CurveData<T>(std::move(p), std::move(n));
-  p.clear();
-  n.clear();
-  CurveDataBase<T>::Release(this);
-  return fresh;
+  return MoveIntoFresh(this, p, n);
 }
 
 template <class T>

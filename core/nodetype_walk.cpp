@@ -54,26 +54,26 @@ int PN(NODETYPE const* nodes, int i, int n) {
   return j;
 }
 
-int NNControl(NODETYPE const* nodes, int i, int n) {
+namespace {
+
+// One step with `step` (NN or PN), then on past control points to the first
+// node that is not one, or to where the walk stops moving. A ring holds at
+// most n nodes; the bound keeps a ring of arcs alone (never valid) from
+// spinning.
+template <int (*step)(NODETYPE const*, int, int)>
+int StepPastControls(NODETYPE const* nodes, int i, int n) {
   if (bad(nodes, i, n)) return i;
-  int j = NN(nodes, i, n);
-  // A ring holds at most n nodes; the bound keeps a ring of arcs alone (never
-  // valid) from spinning.
+  int j = step(nodes, i, n);
   for (int steps = 0; steps < n && IsArc(nodes[j]); ++steps) {
-    const int k = NN(nodes, j, n);
+    const int k = step(nodes, j, n);
     if (k == j) break;
     j = k;
   }
   return j;
 }
 
-int PNControl(NODETYPE const* nodes, int i, int n) {
-  if (bad(nodes, i, n)) return i;
-  int j = PN(nodes, i, n);
-  for (int steps = 0; steps < n && IsArc(nodes[j]); ++steps) {
-    const int k = PN(nodes, j, n);
-    if (k == j) break;
-    j = k;
-  }
-  return j;
-}
+}  // namespace
+
+int NNControl(NODETYPE const* nodes, int i, int n) { return StepPastControls<NN>(nodes, i, n); }
+
+int PNControl(NODETYPE const* nodes, int i, int n) { return StepPastControls<PN>(nodes, i, n); }

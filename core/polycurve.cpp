@@ -32,6 +32,19 @@ void ConvertPoints(From const* src, To* dst, unsigned long n) noexcept {
   for (unsigned long i = 0; i < n; ++i) dst[i] = MavikMath::FromV<To>(MavikMath::ToV(src[i]));
 }
 
+// The first `size` entries of the arrays copied into p and nd, which get room
+// for `capacity` entries first, so that a fork that grows next copies once.
+template <class T>
+void CopyWithRoom(T const* points, NODETYPE const* nodes, unsigned long size, unsigned long capacity,
+                  std::vector<T>& p, std::vector<NODETYPE>& nd) {
+  p.reserve(capacity);
+  nd.reserve(capacity);
+  if (size > 0) {
+    p.assign(points, points + size);
+    nd.assign(nodes, nodes + size);
+  }
+}
+
 }  // namespace
 
 // ---- Construction and lifetime ----------------------------------------------
@@ -297,12 +310,7 @@ void PolycurveT<T>::Reserve(unsigned long n) {
     // Copy once into arrays of the final capacity instead of fork-then-grow.
     std::vector<T> p;
     std::vector<NODETYPE> nd;
-    p.reserve(n);
-    nd.reserve(n);
-    if (size > 0) {
-      p.assign(GetPoints(), GetPoints() + size);
-      nd.assign(GetNodeTypes(), GetNodeTypes() + size);
-    }
+    CopyWithRoom(GetPoints(), GetNodeTypes(), size, n, p, nd);
     data = data->MoveData(p, nd);
     return;
   }
@@ -345,10 +353,7 @@ bool PolycurveT<T>::SetPoints(T const* points, NODETYPE const* nodes, unsigned l
     // Copying the old content only to overwrite it would be wasted.
     std::vector<T> p;
     std::vector<NODETYPE> nd;
-    if (n > 0) {
-      p.assign(points, points + n);
-      nd.assign(nodes, nodes + n);
-    }
+    CopyWithRoom(points, nodes, n, n, p, nd);
     data = data->MoveData(p, nd);
     return true;
   }
@@ -384,12 +389,7 @@ void PolycurveT<T>::Append(T const* points, NODETYPE const* nodes, unsigned long
     if (m > ~0ul - size) throw std::length_error("PolycurveT::PushBack");
     std::vector<T> p;
     std::vector<NODETYPE> nd;
-    p.reserve(size + m);
-    nd.reserve(size + m);
-    if (size > 0) {
-      p.assign(GetPoints(), GetPoints() + size);
-      nd.assign(GetNodeTypes(), GetNodeTypes() + size);
-    }
+    CopyWithRoom(GetPoints(), GetNodeTypes(), size, size + m, p, nd);
     p.insert(p.end(), points, points + m);
     nd.insert(nd.end(), nodes, nodes + m);
     data = data->MoveData(p, nd);

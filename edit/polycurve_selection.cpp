@@ -25,6 +25,13 @@ NODETYPE withEnabled(NODETYPE b, bool on) noexcept {
   return NODETYPE(b & ~clear);
 }
 
+// Enables the nodes of which `is` holds and disables all others. The queries
+// read only move and closed bits, which this leaves alone.
+template <bool (*is)(NODETYPE const*, int, int)>
+void EnableOnly(NODETYPE* nodes, int n) noexcept {
+  for (int i = 0; i < n; ++i) nodes[i] = withEnabled(nodes[i], is(nodes, n, i));
+}
+
 }  // namespace
 
 template <class T>
@@ -119,16 +126,14 @@ template <class T>
 void PolycurveT<T>::EnableFirstAndLastInOpenSubpaths() {
   if (IsEmpty()) return;
   CurveBuffer<T> buf = GetBuffer();
-  for (int i = 0; i < buf.count; ++i)
-    buf.nodes[i] = withEnabled(buf.nodes[i], CRV_IsFirstOrLastOpenSubpathNode(buf.nodes, buf.count, i));
+  EnableOnly<CRV_IsFirstOrLastOpenSubpathNode>(buf.nodes, buf.count);
 }
 
 template <class T>
 void PolycurveT<T>::EnableFirstAndLastInClosedSubpaths() {
   if (IsEmpty()) return;
   CurveBuffer<T> buf = GetBuffer();
-  for (int i = 0; i < buf.count; ++i)
-    buf.nodes[i] = withEnabled(buf.nodes[i], CRV_IsFirstOrLastClosedSubpathNode(buf.nodes, buf.count, i));
+  EnableOnly<CRV_IsFirstOrLastClosedSubpathNode>(buf.nodes, buf.count);
 }
 
 template <class T>

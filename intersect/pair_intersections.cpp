@@ -124,6 +124,18 @@ bool AddBezierCrossings(const SegmentGeometry& A, const SegmentGeometry& B, int 
   return crossed;
 }
 
+// A point (an end of segment pointSegment, with its tangent and curvature at
+// parameter t there) on the touched segment within squared distance
+// tolSquared: the candidate, the touched segment first.
+bool TouchCandidate(const SegmentGeometry& touched, int touchedSegment, const V& point, int pointSegment,
+                    const D& tangent, double curvature, double t, double tolSquared,
+                    IntersectionCandidate& c) noexcept {
+  return touched.bezier ? TouchBezierCandidate(touched, touchedSegment, point, pointSegment, tangent, curvature, t,
+                                               tolSquared, c)
+                        : TouchLineCandidate(touched.p, touchedSegment, touched.Tangent(0.0), point, pointSegment,
+                                             tangent, curvature, t, tolSquared, c);
+}
+
 // The shared skeleton. aPts and bPts are the segments' own first points.
 template <class T>
 void RunPair(PairKind kind, T const* aPts, T const* bPts, int a, int b, SegmentsT<T>& segments, JointType joint,
@@ -199,12 +211,7 @@ void RunPair(PairKind kind, T const* aPts, T const* bPts, int a, int b, Segments
                    bool atOne) -> bool {
     const double t = atOne ? 1.0 : 0.0;
     IntersectionCandidate c;
-    const bool found =
-        touched.bezier
-            ? TouchBezierCandidate(touched, touchedSegment, end.EndAt(atOne), endSegment, D{}, 0.0, t, tts, c)
-            : TouchLineCandidate(touched.p, touchedSegment, touched.Tangent(0.0), end.EndAt(atOne), endSegment, D{},
-                                 0.0, t, tts, c);
-    if (!found) return false;
+    if (!TouchCandidate(touched, touchedSegment, end.EndAt(atOne), endSegment, D{}, 0.0, t, tts, c)) return false;
     c.second.otherTangent = end.Tangent(t);
     c.second.otherCurvature = end.Curvature(t);
     return AddCandidate(c.second, segments, normalize, true).first != nullptr;
@@ -246,22 +253,17 @@ void RunPair(PairKind kind, T const* aPts, T const* bPts, int a, int b, Segments
     list[n++] = {A.EndAt(aAtOne), IntersectionParams{ta, a, A.Tangent(ta), A.Curvature(ta), tb, b, B.Tangent(tb),
                                                      B.Curvature(tb), B.EndAt(bAtOne)}};
   }
-  for (int k = 0; k < 2; ++k) {
-    const double t = k;
-    const V pt = A.EndAt(k == 1);
-    const bool found = bBezier ? TouchBezierCandidate(B, b, pt, a, A.Tangent(t), A.Curvature(t), t, q, list[n])
-                               : TouchLineCandidate(B.p, b, B.Tangent(0.0), pt, a, A.Tangent(t), A.Curvature(t), t,
-                                                    q, list[n]);
-    if (found) ++n;
-  }
-  for (int k = 0; k < 2; ++k) {
-    const double t = k;
-    const V pt = B.EndAt(k == 1);
-    const bool found = aBezier ? TouchBezierCandidate(A, a, pt, b, B.Tangent(t), B.Curvature(t), t, q, list[n])
-                               : TouchLineCandidate(A.p, a, A.Tangent(0.0), pt, b, B.Tangent(t), B.Curvature(t), t,
-                                                    q, list[n]);
-    if (found) ++n;
-  }
+  // The ends of one segment near the other, A's ends first.
+  auto nearEnds = [&](const SegmentGeometry& touched, int touchedSegment, const SegmentGeometry& end, int endSegment) {
+    for (int k = 0; k < 2; ++k) {
+      const double t = k;
+      if (TouchCandidate(touched, touchedSegment, end.EndAt(k == 1), endSegment, end.Tangent(t), end.Curvature(t), t,
+                         q, list[n]))
+        ++n;
+    }
+  };
+  nearEnds(B, b, A, a);
+  nearEnds(A, a, B, b);
   int best = -1;
   double bestDistance = 0.0;
   for (int k = 0; k < n; ++k) {
@@ -281,33 +283,35 @@ T const* OwnPoints(T const* curvePoints, const SegmentsT<T>& segments, int segme
   return curvePoints + segments.segments[segment].firstNode;
 }
 
+// Runs a pair given by its curves' arrays; nothing when either segment has
+// no points there.
+template <class T>
+void RunOwnPair(PairKind kind, T const* firstPoints, T const* secondPoints, int first, int second,
+                SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
+  T const* a = OwnPoints(firstPoints, segments, first);
+  T const* b = OwnPoints(secondPoints, segments, second);
+  if (!a || !b) return;
+  RunPair(kind, a, b, first, second, segments, joint, settings);
+}
+
 }  // namespace
 
 template <class T>
 void AddLineIntersections(T const* firstPoints, T const* secondPoints, int first, int second, SegmentsT<T>& segments,
                           JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(firstPoints, segments, first);
-  T const* b = OwnPoints(secondPoints, segments, second);
-  if (!a || !b) return;
-  RunPair(PairKind::Lines, a, b, first, second, segments, joint, settings);
+  RunOwnPair(PairKind::Lines, firstPoints, secondPoints, first, second, segments, joint, settings);
 }
 
 template <class T>
 void AddLineBezierIntersections(T const* linePoints, T const* bezierPoints, int line, int bezier,
                                 SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(linePoints, segments, line);
-  T const* b = OwnPoints(bezierPoints, segments, bezier);
-  if (!a || !b) return;
-  RunPair(PairKind::LineBezier, a, b, line, bezier, segments, joint, settings);
+  RunOwnPair(PairKind::LineBezier, linePoints, bezierPoints, line, bezier, segments, joint, settings);
 }
 
 template <class T>
 void AddBezierIntersections(T const* firstPoints, T const* secondPoints, int first, int second,
                             SegmentsT<T>& segments, JointType joint, const SegmentIntersectionSettings& settings) {
-  T const* a = OwnPoints(firstPoints, segments, first);
-  T const* b = OwnPoints(secondPoints, segments, second);
-  if (!a || !b) return;
-  RunPair(PairKind::Beziers, a, b, first, second, segments, joint, settings);
+  RunOwnPair(PairKind::Beziers, firstPoints, secondPoints, first, second, segments, joint, settings);
 }
 
 template <class T>

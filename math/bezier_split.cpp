@@ -24,31 +24,37 @@ void Store(const V* v, T* out, int count) noexcept {
   for (int i = 0; i < count; ++i) out[i] = FromV<T>(v[i]);
 }
 
+// The seven points of the Bezier cut at t (left part o[0..3], right part
+// o[3..6]), in doubles; p may be the array the caller writes to afterwards.
+template <class T>
+void CutAt(double t, const T* p, V* o) noexcept {
+  V in[4];
+  Load(p, in);
+  SplitPoints(in, t, o);
+}
+
 }  // namespace
 
 template <class T>
 void Split(double t, const T* p, T* left, T* right) noexcept {
-  V in[4], o[7];
-  Load(p, in);
-  SplitPoints(in, t, o);
+  V o[7];
+  CutAt(t, p, o);
   Store(o, left, 4);
   Store(o + 3, right, 4);
 }
 
 template <class T>
 void Split(double t, const T* p, T* out) noexcept {
-  V in[4], o[7];
-  Load(p, in);
-  SplitPoints(in, t, o);
+  V o[7];
+  CutAt(t, p, o);
   Store(o, out, 7);
 }
 
 template <class T>
 void Split(double t1, double t2, const T* p, T* out) noexcept {
   if (t2 < t1) std::swap(t1, t2);
-  V in[4], first[7], second[7];
-  Load(p, in);
-  SplitPoints(in, t1, first);
+  V first[7], second[7];
+  CutAt(t1, p, first);
   // The second cut lies on the right part at the rescaled parameter; when t1
   // is 1 the right part is a point and any parameter gives it.
   const double rest = 1.0 - t1;
@@ -62,17 +68,15 @@ void Split(double t1, double t2, const T* p, T* out) noexcept {
 
 template <class T>
 void LeftOf(double t, const T* p, T* out) noexcept {
-  V in[4], o[7];
-  Load(p, in);
-  SplitPoints(in, t, o);
+  V o[7];
+  CutAt(t, p, o);
   Store(o, out, 4);
 }
 
 template <class T>
 void RightOf(double t, const T* p, T* out) noexcept {
-  V in[4], o[7];
-  Load(p, in);
-  SplitPoints(in, t, o);
+  V o[7];
+  CutAt(t, p, o);
   Store(o + 3, out, 4);
 }
 

@@ -12,21 +12,16 @@ using Framework::common_types::RECT;
 
 namespace {
 
-int32_t SaturateFloor(double v) noexcept {
-  if (!(v == v)) return 0;
-  const double f = std::floor(v);
-  if (f >= 2147483647.0) return INT32_MAX;
-  if (f <= -2147483648.0) return INT32_MIN;
-  return static_cast<int32_t>(f);
+// A whole number clamped to the int32 range; 0 for NaN.
+int32_t SaturateWhole(double w) noexcept {
+  if (!(w == w)) return 0;
+  if (w >= 2147483647.0) return INT32_MAX;
+  if (w <= -2147483648.0) return INT32_MIN;
+  return static_cast<int32_t>(w);
 }
 
-int32_t SaturateCeil(double v) noexcept {
-  if (!(v == v)) return 0;
-  const double c = std::ceil(v);
-  if (c >= 2147483647.0) return INT32_MAX;
-  if (c <= -2147483648.0) return INT32_MIN;
-  return static_cast<int32_t>(c);
-}
+int32_t SaturateFloor(double v) noexcept { return SaturateWhole(std::floor(v)); }
+int32_t SaturateCeil(double v) noexcept { return SaturateWhole(std::ceil(v)); }
 
 int32_t Saturate(int64_t v) noexcept {
   return static_cast<int32_t>(std::clamp<int64_t>(v, INT32_MIN, INT32_MAX));

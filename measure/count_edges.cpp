@@ -30,7 +30,6 @@
 #include "ostracrv/measure/count_edges.h"
 
 #include <cmath>
-#include <type_traits>
 
 #include "probe_curves.h"
 
@@ -42,15 +41,6 @@ using MavikMath::V;
 namespace {
 
 constexpr double kOnEdgeSquared = 2.0;
-
-// A meeting point as the point kind sees it: rounded for integer curves.
-template <class T>
-V Seen(const V& q) {
-  if constexpr (std::is_same_v<T, POINT>)
-    return MavikMath::ToV(MavikMath::FromV<POINT>(q));
-  else
-    return q;
-}
 
 }  // namespace
 
@@ -69,7 +59,7 @@ void CountEdges(CoordinateSystem system, const SegmentIntersections& probe, T p,
   for (const Intersection* r : probe.intersections) {
     const Intersection* o = r ? r->other : nullptr;
     if (!o) continue;
-    const V q = Seen<T>(r->point);
+    const V q = probe::Seen<T>(r->point);
     const double dx = q.x - pv.x, dy = q.y - pv.y;
     if (dx * dx + dy * dy <= kOnEdgeSquared) {
       onEdge = true;
@@ -86,7 +76,7 @@ void CountEdges(CoordinateSystem system, const SegmentIntersections& probe, T p,
         ++turns[side];
       else if (dir < 0)
         --turns[side];
-    } else if (before && r->overlapEnd && pAlong < along(Seen<T>(r->overlapEnd->point))) {
+    } else if (before && r->overlapEnd && pAlong < along(probe::Seen<T>(r->overlapEnd->point))) {
       onEdge = true;
       onOverlap = true;
     }

@@ -10,6 +10,7 @@
 #pragma once
 
 #include <cmath>
+#include <type_traits>
 #include <vector>
 
 #include "ostracrv/core/nodetype.h"
@@ -25,6 +26,15 @@ inline constexpr double kAtNode = 1e-9;
 
 inline bool AtStart(double t) { return std::fabs(t) <= kAtNode; }
 inline bool AtEnd(double t) { return std::fabs(t - 1.0) <= kAtNode; }
+
+// A meeting point as the point kind sees it: rounded for integer curves.
+template <class T>
+MavikMath::V Seen(const MavikMath::V& q) {
+  if constexpr (std::is_same_v<T, Framework::common_types::POINT>)
+    return MavikMath::ToV(MavikMath::FromV<Framework::common_types::POINT>(q));
+  else
+    return q;
+}
 
 // The node bytes of the probe: an open move and a line (user nodes).
 inline constexpr NODETYPE kProbeNodes[2] = {0x04, 0x44};

@@ -32,7 +32,6 @@
 #include <algorithm>
 #include <cmath>
 #include <limits>
-#include <type_traits>
 
 #include "ostracrv/math/polynomial.h"
 #include "probe_curves.h"
@@ -80,14 +79,6 @@ double FarthestAcross(const V* p, bool bezier, double ta, double tb, const Frame
       if (std::fabs(v) > std::fabs(best)) best = v;
     }
   return best;
-}
-
-template <class T>
-V Seen(const V& q) {
-  if constexpr (std::is_same_v<T, POINT>)
-    return MavikMath::ToV(MavikMath::FromV<POINT>(q));
-  else
-    return q;
 }
 
 double Squared(const V& a, const V& b) { return (a.x - b.x) * (a.x - b.x) + (a.y - b.y) * (a.y - b.y); }

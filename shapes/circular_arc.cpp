@@ -27,22 +27,17 @@
 
 #include <algorithm>
 #include <cmath>
-#include <numbers>
 
+#include "arc_common.h"
 #include "ostracrv/core/path_reverse.h"
 #include "ostracrv/math/angles.h"
 
 namespace OstraCrv {
 
-using Framework::common_types::POINT;
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
 
-constexpr double kEps = MavikMath::kEpsilon;
-constexpr double kHalfPi = std::numbers::pi / 2.0;
-constexpr double kTwoPi = 2.0 * std::numbers::pi;
 // A sweep this close to a whole number of quadrants gets no sliver piece.
 constexpr double kQuadrantTolerance = 1e-5;
 constexpr int kMaxPieces = 4;
@@ -57,17 +52,8 @@ unsigned long LineFallback(T* points, NODETYPE* nodes, const V& s, const V& e) {
   return 2;
 }
 
-// The chord's left normal scaled to r, or (r, c.x) for a chord too short to
-// have a direction.
-D ApexNormal(const D& c, double r) noexcept {
-  const double l2 = c.SquaredLength();
-  if (!(std::fabs(l2) > kEps)) return D{r, c.x};
-  const double l = std::sqrt(l2);
-  return D{-c.y / l * r, c.x / l * r};
-}
-
 bool PassesApexTest(const V& from, const V& centre, const D& chord, double r) noexcept {
-  const V far = centre - ApexNormal(chord, r);
+  const V far = centre - ScaledLeftNormal(chord, r);
   // NaN fails as well as a far point.
   return MavikMath::Distance(from, far) < kArcApexLimit;
 }
@@ -110,7 +96,7 @@ unsigned long BuildCircularArcT(T* points, NODETYPE* nodes, const V& center, dou
   n = std::clamp(n, 0, kMaxPieces);
   const double d = n > 0 ? sweep / n : 0.0;
   const double half = d / 2.0;
-  const double k = n > 0 ? radius * 4.0 * (1.0 - std::cos(half)) / (3.0 * std::sin(half)) : 0.0;
+  const double k = CircleHandleLength(radius, half);
 
   V local[kMaxPoints];
   local[0] = V{center.x + radius * std::cos(a0), center.y + radius * std::sin(a0)};

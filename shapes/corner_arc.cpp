@@ -20,34 +20,22 @@
 #include "ostracrv/shapes/corner_arc.h"
 
 #include <cmath>
-#include <numbers>
 
+#include "arc_common.h"
 #include "ostracrv/shapes/curve_append.h"
 
 namespace OstraCrv {
 
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
 
-constexpr double kEps = MavikMath::kEpsilon;
-constexpr double kHalfPi = std::numbers::pi / 2.0;
 // Cosine below which a corner arc is split into two Beziers.
 constexpr double kTwoPieceCosine = -0.001;
 // Cosine at or above which a fillet arc is too straight to draw.
 constexpr double kFilletStraightCosine = 0.9999;
 // A fillet chord passing closer than this to the centre has no usable middle.
 constexpr double kFilletMinMidDistance = 5.0;
-
-// The unit left normal of u scaled to h, or (h, u.x) for a u too short to
-// have a direction.
-D NormalHandle(const D& u, double h) noexcept {
-  const double l2 = u.SquaredLength();
-  if (!(l2 > kEps)) return D{h, u.x};
-  const double l = std::sqrt(l2);
-  return D{-u.y / l * h, u.x / l * h};
-}
 
 // Cosine of the angle at center between a and b; NaN for a degenerate or
 // non-finite pair. P is |a - center|^2 |b - center|^2.
@@ -66,7 +54,7 @@ int GetArcSegmentHandles(V* handles, const V& center, const V& a, const V& b) {
   const double s = std::sqrt(1.0 - c * c);
   const double angle = kHalfPi - std::atan2(c, s);
   const double h = r * angle * kCornerArcHandle / kHalfPi;
-  const D p = NormalHandle(u, h), q = NormalHandle(v, h);
+  const D p = ScaledLeftNormal(u, h), q = ScaledLeftNormal(v, h);
   if (MavikMath::Dot(b - a, p) < 0.0) {
     handles[0] = a - p;
     handles[1] = b + q;
@@ -76,6 +64,19 @@ int GetArcSegmentHandles(V* handles, const V& center, const V& a, const V& b) {
   }
   return 1;
 }
+
+namespace {
+
+// A wide corner arc as two Beziers meeting at m, the arc's middle: writes the
+// handles of both and m in between (h0, h1, m, h2, h3); 0 when either piece
+// has none.
+int SplitArcHandles(V* out, const V& center, const V& a, const V& m, const V& b) {
+  out[2] = m;
+  const int ok = GetArcSegmentHandles(out, center, a, m);
+  return ok ? GetArcSegmentHandles(out + 3, center, m, b) : ok;
+}
+
+}  // namespace
 
 int BuildCircularArc(const V& center, const D& direction, const V& a, const V& b, double radius, V* out,
                      int& count) {
@@ -87,11 +88,8 @@ int BuildCircularArc(const V& center, const D& direction, const V& a, const V& b
     if (c < kTwoPieceCosine) {
       D dir = direction;
       const V m = dir.Normalize() ? center + dir * radius : center + D{radius, direction.y};
-      out[2] = m;
-      int ok = GetArcSegmentHandles(out, center, a, m);
-      if (ok) ok = GetArcSegmentHandles(out + 3, center, m, b);
       count = 5;
-      return ok;
+      return SplitArcHandles(out, center, a, m, b);
     }
     if (!(c < 1.0)) return 0;
   }
@@ -112,11 +110,8 @@ int BuildCircularArc(const V& center, const V& a, const V& b, double radius, V* 
       if (!(toMid.Length() >= kFilletMinMidDistance)) return 0;
       toMid.Normalize();
       const V m = center + toMid * radius;
-      out[2] = m;
-      int ok = GetArcSegmentHandles(out, center, a, m);
-      if (ok) ok = GetArcSegmentHandles(out + 3, center, m, b);
       count = 5;
-      return ok;
+      return SplitArcHandles(out, center, a, m, b);
     }
     if (!(c < kFilletStraightCosine)) return 0;
   }

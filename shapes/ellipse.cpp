@@ -22,22 +22,17 @@
 
 #include <algorithm>
 #include <cmath>
-#include <numbers>
 
+#include "arc_common.h"
 #include "ostracrv/math/angles.h"
 #include "ostracrv/math/matrix.h"
 
 namespace OstraCrv {
 
-using Framework::common_types::POINT;
-using MavikMath::D;
-using MavikMath::V;
+using namespace arc_internal;
 
 namespace {
 
-constexpr double kEps = MavikMath::kEpsilon;
-constexpr double kHalfPi = std::numbers::pi / 2.0;
-constexpr double kTwoPi = 2.0 * std::numbers::pi;
 // Five pieces, 3 points each, the first point, and two centre points of a pie.
 constexpr int kLocalPoints = 18;
 constexpr int kMaxPieces = 5;
@@ -78,11 +73,9 @@ unsigned long BuildEllipseT(T* points, NODETYPE* nodes, const T& center, double 
   for (int k = 1; k <= kMaxPieces; ++k) {
     const double boundary = (q + k) * kHalfPi;
     const double t = std::min(boundary, e);
-    const double half = (t - s) / 2.0;
-    const double sn = std::sin(half);
     // A piece of no sweep (a start that lies on a boundary up to rounding)
-    // gets no handles rather than 0/0.
-    const double h = sn != 0.0 ? 4.0 * (1.0 - std::cos(half)) / (3.0 * sn) : 0.0;
+    // gets no handles.
+    const double h = CircleHandleLength(1.0, (t - s) / 2.0);
     const V p = local[i];
     const V qv = V(MavikMath::Radians::AngleToVector(t));
     local[i + 1] = V{p.x - h * p.y, p.y + h * p.x};

@@ -112,6 +112,17 @@ struct Outline {
   }
 };
 
+// The corners of a box clockwise (y up) from its top left and back to it:
+// the outline of the RECT and bounds forms.
+template <class P, class Box>
+void WriteBoxCorners(P* points, const Box& r) noexcept {
+  points[0] = {r.left, r.top};
+  points[1] = {r.right, r.top};
+  points[2] = {r.right, r.bottom};
+  points[3] = {r.left, r.bottom};
+  points[4] = {r.left, r.top};
+}
+
 RectangleCorner Normalised(RectangleCorner c) noexcept {
   if (c == RectangleCorner::Round || c == RectangleCorner::Scallop) return c;
   return RectangleCorner::Chamfer;
@@ -142,11 +153,7 @@ unsigned long BuildRectangle(POINT* points, NODETYPE* nodes, double width, doubl
 
 unsigned long BuildRectangle(POINT* points, const RECT& r) {
   if (!points) return 0;
-  points[0] = {r.left, r.top};
-  points[1] = {r.right, r.top};
-  points[2] = {r.right, r.bottom};
-  points[3] = {r.left, r.bottom};
-  points[4] = {r.left, r.top};
+  WriteBoxCorners(points, r);
   return 5;
 }
 
@@ -159,11 +166,7 @@ unsigned long BuildRectangle(POINT* points, NODETYPE* nodes, const RECT& rect) {
 unsigned long BuildRectangle(V* points, const MavikMath::BoundsT<double>& b) {
   if (!points || !IsFinite(b)) return 0;
   // The bounds' top is their largest y: the same corners as the RECT form.
-  points[0] = {b.left, b.top};
-  points[1] = {b.right, b.top};
-  points[2] = {b.right, b.bottom};
-  points[3] = {b.left, b.bottom};
-  points[4] = {b.left, b.top};
+  WriteBoxCorners(points, b);
   return 5;
 }
 

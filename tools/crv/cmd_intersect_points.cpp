@@ -5,13 +5,12 @@
 // and shared stretches among them, a subpath's own loops included. Each
 // meeting is printed once, with the two segments it lies on; with -o the
 // paths are drawn and the meetings marked over them.
-#include <algorithm>
 #include <cmath>
-#include <fstream>
 #include <iostream>
 #include <sstream>
 
 #include "common.h"
+#include "drawing.h"
 #include "polycurve.h"
 
 namespace crv {
@@ -77,17 +76,12 @@ bool ParseNumber(const std::string& text, double& v) {
   }
 }
 
-std::string F(double v) { return Number(v, 9); }
-
 }  // namespace
 
 int RunIntersectPoints(const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output", "--tolerance", "--precision"}, {}, message))
+  if (!args.Parse(WithLongOutput(argv), {"--output", "--tolerance", "--precision"}, {}, message))
     return UsageError("intersect-points", message);
   if (args.help) {
     std::cout << kIntersectPointsHelp;
@@ -169,40 +163,17 @@ int RunIntersectPoints(const std::vector<std::string>& argv) {
   // The drawing, in the first file's document coordinates.
   const auto& frame = docs[0].frame;
   const MATRIX toDoc = frame.ToDocument();
-  MavikMath::Bounds area;
-  if (frame.hasViewBox) {
-    area = frame.viewBox;
-  } else {
-    for (const auto& d : docs)
-      for (const auto& shape : d.shapes)
-        for (const V& p : shape.curve.Points()) area.Add(toDoc(p));
-    if (area.IsEmpty()) area = MavikMath::Bounds{0, 100, 100, 0};
-    const double pad = 0.05 * std::max(area.Width(), area.Height()) + 1e-9;
-    MavikMath::InflateRect(area, pad, pad);
-  }
-  const double s = std::max(area.Width(), area.Height()) / 100;
-  const double margin = 2 * s, legendHeight = 5 * s;
-  const double vx = area.left - margin, vy = area.bottom - margin;
-  const double vw = area.Width() + 2 * margin, vh = area.Height() + 2 * margin + legendHeight;
-  const double scale = 800 / std::max(vw, vh);
+  const Canvas canvas = MakeCanvas(DrawingArea(docs.data(), docs.size(), false), 5);
+  const MavikMath::Bounds& area = canvas.area;
+  const double s = canvas.s, margin = canvas.margin;
 
   std::ostringstream o;
-  o << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-    << "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"" << F(vx) << " " << F(vy) << " " << F(vw) << " "
-    << F(vh) << "\" width=\"" << F(vw * scale) << "\" height=\"" << F(vh * scale) << "\">\n"
-    << "<rect x=\"" << F(vx) << "\" y=\"" << F(vy) << "\" width=\"" << F(vw) << "\" height=\"" << F(vh)
-    << "\" fill=\"white\"/>\n";
+  OpenDrawing(o, canvas, "");
   const char* colours[2] = {"#1f2937", "#ea580c"};
   for (std::size_t f = 0; f < docs.size(); ++f) {
     o << "<g id=\"paths" << f + 1 << "\" fill=\"none\" stroke=\"" << colours[f] << "\" stroke-width=\""
       << F(0.2 * s) << "\">\n";
-    for (const auto& shape : docs[f].shapes) {
-      const std::string d = OstraCrv::svgdoc::ToDocumentPathData(shape.curve, frame);
-      if (d.empty()) continue;
-      o << "<path";
-      if (!shape.id.empty()) o << " id=\"" << OstraCrv::svgdoc::XmlEscape(shape.id) << "\"";
-      o << " d=\"" << d << "\"/>\n";
-    }
+    for (const auto& shape : docs[f].shapes) WriteShapePath(o, shape, frame, "");
     o << "</g>\n";
   }
 
@@ -249,19 +220,14 @@ int RunIntersectPoints(const std::vector<std::string>& argv) {
   o << "</g>\n";
 
   const char* kinds[4] = {"crossing", "touch", "overlap start", "overlap end"};
-  o << "<g id=\"legend\" font-family=\"sans-serif\" font-size=\"" << F(1.6 * s) << "\" fill=\"#1f2937\">\n";
+  OpenLegend(o, s);
   for (int k = 0; k < 4; ++k) {
     const V p{area.left + k * (area.Width() / 4) + s, area.top + margin + 2 * s};
     mark(o, kinds[k], p);
-    o << "<text x=\"" << F(p.x + 1.5 * s) << "\" y=\"" << F(p.y + 0.55 * s) << "\">" << kinds[k] << "</text>\n";
+    LegendLabel(o, p, s, kinds[k]);
   }
   o << "</g>\n</svg>\n";
-
-  std::ofstream file(out, std::ios::binary);
-  file << o.str();
-  file.close();
-  if (!file) return InputError(out, "cannot write file");
-  return kOk;
+  return WriteTextFile(out, o.str());
 }
 
 }  // namespace crv

@@ -9,14 +9,13 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <fstream>
 #include <iostream>
 #include <sstream>
 
 #include "common.h"
+#include "drawing.h"
 #include "polycurve.h"
 
 namespace crv {
@@ -45,8 +44,6 @@ const char* const kRenderHelp =
 namespace {
 
 using MavikMath::V;
-
-std::string F(double v) { return Number(v, 9); }
 
 struct Style {
   double s;  // marker size
@@ -128,11 +125,7 @@ bool RunConverter(const std::string& program, const std::string& in, const std::
 int RunRender(const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  // -o is the short form of --output.
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output"}, {"--png"}, message)) return UsageError("render", message);
+  if (!args.Parse(WithLongOutput(argv), {"--output"}, {"--png"}, message)) return UsageError("render", message);
   if (args.help) {
     std::cout << kRenderHelp;
     return kOk;
@@ -146,49 +139,18 @@ int RunRender(const std::vector<std::string>& argv) {
   if (!LoadDocument(file, doc)) return kInputError;
   const auto& frame = doc.frame;
   const MATRIX toDoc = frame.ToDocument();
-
-  // The drawing's rectangle in document coordinates.
-  MavikMath::Bounds area;
-  if (frame.hasViewBox) {
-    area = frame.viewBox;
-  } else if (frame.width > 0 && frame.height > 0) {
-    area.left = 0;
-    area.bottom = 0;
-    area.right = frame.width;
-    area.top = frame.height;
-  } else {
-    for (const auto& shape : doc.shapes)
-      for (const V& p : shape.curve.Points()) area.Add(toDoc(p));
-    if (area.IsEmpty()) {
-      area.left = area.bottom = 0;
-      area.right = area.top = 100;
-    }
-    const double pad = 0.05 * std::max(area.Width(), area.Height()) + 1e-9;
-    MavikMath::InflateRect(area, pad, pad);
-  }
-  const double s = std::max(area.Width(), area.Height()) / 100;
-  const double margin = 2 * s, legendHeight = 7 * s;
-  const double vx = area.left - margin, vy = area.bottom - margin;
-  const double vw = area.Width() + 2 * margin, vh = area.Height() + 2 * margin + legendHeight;
-  const double scale = 800 / std::max(vw, vh);
+  const Canvas canvas = MakeCanvas(DrawingArea(&doc, 1, true), 7);
+  const MavikMath::Bounds& area = canvas.area;
+  const double s = canvas.s, margin = canvas.margin;
 
   std::ostringstream o;
-  o << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-    << "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"" << F(vx) << " " << F(vy) << " " << F(vw) << " "
-    << F(vh) << "\" width=\"" << F(vw * scale) << "\" height=\"" << F(vh * scale) << "\">\n"
-    << "<!-- crv render of " << OstraCrv::svgdoc::XmlEscape(file) << " -->\n"
-    << "<rect x=\"" << F(vx) << "\" y=\"" << F(vy) << "\" width=\"" << F(vw) << "\" height=\"" << F(vh)
-    << "\" fill=\"white\"/>\n";
+  OpenDrawing(o, canvas, "crv render of " + OstraCrv::svgdoc::XmlEscape(file));
 
   // Paths, then handles, control points and nodes on top.
   o << "<g id=\"paths\" stroke=\"#1f2937\" stroke-width=\"" << F(0.15 * s) << "\" fill-opacity=\"0.2\">\n";
   for (const auto& shape : doc.shapes) {
-    const std::string d = OstraCrv::svgdoc::ToDocumentPathData(shape.curve, frame);
-    if (d.empty()) continue;
-    o << "<path";
-    if (!shape.id.empty()) o << " id=\"" << OstraCrv::svgdoc::XmlEscape(shape.id) << "\"";
-    o << " d=\"" << d << "\" fill=\"" << FillOf(shape) << "\" fill-rule=\""
-      << (shape.fillRule == OstraCrv::svgdoc::FillRule::evenodd ? "evenodd" : "nonzero") << "\"/>\n";
+    const char* rule = shape.fillRule == OstraCrv::svgdoc::FillRule::evenodd ? "evenodd" : "nonzero";
+    WriteShapePath(o, shape, frame, " fill=\"" + FillOf(shape) + "\" fill-rule=\"" + rule + "\"");
   }
   o << "</g>\n";
 
@@ -230,20 +192,15 @@ int RunRender(const std::vector<std::string>& argv) {
   } legend[] = {{Mark::node, "node"},           {Mark::openStart, "open start"}, {Mark::openEnd, "open end"},
                 {Mark::closedStart, "closed start"}, {Mark::loneMove, "lone move"}, {Mark::control, "control point"}};
   const double ly = area.top + margin + 2 * s;
-  o << "<g id=\"legend\" font-family=\"sans-serif\" font-size=\"" << F(1.6 * s) << "\" fill=\"#1f2937\">\n";
+  OpenLegend(o, s);
   for (int k = 0; k < 6; ++k) {
     const V p{area.left + (k % 3) * (area.Width() / 3) + s, ly + (k / 3) * 2.6 * s};
-    std::ostringstream mark;
-    DrawMark(mark, legend[k].mark, p, s);
-    o << mark.str() << "<text x=\"" << F(p.x + 1.5 * s) << "\" y=\"" << F(p.y + 0.55 * s) << "\">"
-      << legend[k].text << "</text>\n";
+    DrawMark(o, legend[k].mark, p, s);
+    LegendLabel(o, p, s, legend[k].text);
   }
   o << "</g>\n</svg>\n";
 
-  std::ofstream f(out, std::ios::binary);
-  f << o.str();
-  f.close();
-  if (!f) return InputError(out, "cannot write file");
+  if (const int status = WriteTextFile(out, o.str()); status != kOk) return status;
 
   if (args.Has("--png")) {
     std::string png = out;

@@ -9,11 +9,11 @@
 // filling. The result is written in the first file's frame as one path read
 // under the even-odd rule (the library does not turn the loops of a result
 // to one direction), and a summary line goes to standard output.
-#include <fstream>
 #include <iostream>
 #include <sstream>
 
 #include "common.h"
+#include "drawing.h"
 #include "polycurve.h"
 
 namespace crv {
@@ -72,10 +72,7 @@ Operand MakeOperand(const svgdoc::Document& doc, int rule, WeldFlags flags) {
 int RunWeld(const std::string& command, const std::vector<std::string>& argv) {
   Args args;
   std::string message;
-  std::vector<std::string> argv2 = argv;
-  for (auto& a : argv2)
-    if (a == "-o") a = "--output";
-  if (!args.Parse(argv2, {"--output"}, {"--nonzero", "--evenodd", "--precise"}, message))
+  if (!args.Parse(WithLongOutput(argv), {"--output"}, {"--nonzero", "--evenodd", "--precise"}, message))
     return UsageError(command, message);
   if (args.help) {
     std::cout << kWeldHelp;
@@ -125,10 +122,7 @@ int RunWeld(const std::string& command, const std::vector<std::string>& argv) {
   const std::string d = svgdoc::ToDocumentPathData(result, frame);
   if (!d.empty()) o << "<path id=\"" << command << "\" d=\"" << d << "\" fill=\"#2563eb\" fill-rule=\"evenodd\"/>\n";
   o << "</svg>\n";
-  std::ofstream f(out, std::ios::binary);
-  f << o.str();
-  f.close();
-  if (!f) return InputError(out, "cannot write file");
+  if (const int status = WriteTextFile(out, o.str()); status != kOk) return status;
   std::cout << command << ": " << loops << (loops == 1 ? " loop" : " loops") << ", " << result.GetPointCount()
             << " points\n";
   return kOk;

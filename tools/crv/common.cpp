@@ -77,6 +77,13 @@ bool Args::Parse(const std::vector<std::string>& argv, const std::vector<std::st
   return true;
 }
 
+std::vector<std::string> WithLongOutput(const std::vector<std::string>& argv) {
+  std::vector<std::string> out = argv;
+  for (auto& a : out)
+    if (a == "-o") a = "--output";
+  return out;
+}
+
 bool Args::Has(const std::string& name) const {
   for (const auto& o : options)
     if (o.first == name) return true;

@@ -28,6 +28,10 @@ bool LoadDocument(const std::string& file, OstraCrv::svgdoc::Document& doc);
 // "0" for negative zero.
 std::string Number(double v, int digits = 8);
 
+// argv with the short form -o spelled out as --output, for the commands
+// that write a file.
+std::vector<std::string> WithLongOutput(const std::vector<std::string>& argv);
+
 // Command-line arguments of a subcommand: positional arguments and options
 // with or without a value.
 struct Args {

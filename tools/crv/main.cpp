@@ -61,26 +61,23 @@ int main(int argc, char** argv) {
       std::cout << kHelp;
       return crv::kOk;
     }
-    if (args[0] == "info") {
-      std::cout << crv::kInfoHelp;
-      return crv::kOk;
-    }
-    if (args[0] == "render") {
-      std::cout << crv::kRenderHelp;
-      return crv::kOk;
-    }
-    if (args[0] == "inside") {
-      std::cout << crv::kInsideHelp;
-      return crv::kOk;
-    }
-    if (args[0] == "intersect-points") {
-      std::cout << crv::kIntersectPointsHelp;
-      return crv::kOk;
-    }
-    if (args[0] == "union" || args[0] == "intersect" || args[0] == "subtract" || args[0] == "xor") {
-      std::cout << crv::kWeldHelp;
-      return crv::kOk;
-    }
+    // The help of each command; the set operations share one text.
+    const struct {
+      const char* command;
+      const char* help;
+    } helps[] = {{"info", crv::kInfoHelp},
+                 {"render", crv::kRenderHelp},
+                 {"inside", crv::kInsideHelp},
+                 {"intersect-points", crv::kIntersectPointsHelp},
+                 {"union", crv::kWeldHelp},
+                 {"intersect", crv::kWeldHelp},
+                 {"subtract", crv::kWeldHelp},
+                 {"xor", crv::kWeldHelp}};
+    for (const auto& h : helps)
+      if (args[0] == h.command) {
+        std::cout << h.help;
+        return crv::kOk;
+      }
     std::cerr << "crv help: unknown command '" << args[0] << "'\n";
     return crv::kUsage;
   }

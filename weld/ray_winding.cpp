@@ -17,11 +17,18 @@
 // crossing parameter comes from bisection on the monotone piece. A crossing
 // that goes down counts +1, up -1: counter-clockwise loops wind +1.
 //
-// The segments are sorted into horizontal bands of their boxes, so that a
-// query visits the segments of one band: O(n) to build for n segments, and
-// per query the segments whose heights span the place's. A query fails (the
-// caller falls back to a probe through the engine) when some segment other
-// than the one the place lies on comes within the tolerance of the place.
+// The same with the roles of x and y swapped gives a ray towards -y, for a
+// place on a horizontal edge (which a horizontal ray would run along): there
+// a crossing that goes right counts +1 and left -1 (swapping the axes
+// mirrors the plane, which turns the sign).
+//
+// The segments are sorted into bands of their boxes across the ray (one
+// flat array of segment indices per band, found by counting first), so that
+// a query visits the segments of one band: O(n) to build for n segments,
+// and per query the segments whose extent across the ray spans the place's.
+// A query fails (the caller falls back to a probe through the engine) when
+// some segment other than the one the place lies on comes within the
+// tolerance of the place.
 #include <algorithm>
 #include <cmath>
 #include <limits>
@@ -40,9 +47,14 @@ namespace {
 
 constexpr int kBisections = 60;  // halvings of a monotone piece: past double precision
 
+// The coordinate across the ray (the one whose value the ray keeps) and the
+// one along it, for a ray towards -x (axis 0) or -y (axis 1).
+inline double Across(V const& p, int axis) noexcept { return axis == 0 ? p.y : p.x; }
+inline double Along(V const& p, int axis) noexcept { return axis == 0 ? p.x : p.y; }
+
 }  // namespace
 
-RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to) {
+RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to, int axis) : axis_(axis) {
   for (size_t c = from; c < to && c < curves.size(); ++c) {
     WeldCurve const& wc = curves[c];
     if (!wc.points || !wc.nodes) continue;
@@ -62,31 +74,44 @@ RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t
     }
   }
   if (pieces_.empty()) return;
-  bands_.resize(std::max<size_t>(1, pieces_.size() / 2));
-  for (size_t k = 0; k < pieces_.size(); ++k) {
-    pieces_[k].firstBand = Band(pieces_[k].box.bottom);
-    for (size_t b = pieces_[k].firstBand; b <= Band(pieces_[k].box.top); ++b) bands_[b].push_back(k);
+  bandCount_ = std::max<size_t>(1, pieces_.size() / 2);
+  // Count the pieces of each band, turn the counts into offsets, then fill:
+  // within a band the pieces stay in storage order.
+  bandStart_.assign(bandCount_ + 1, 0);
+  for (Piece& p : pieces_) {
+    p.firstBand = Band(Low(p.box));
+    p.lastBand = Band(High(p.box));
+    for (size_t b = p.firstBand; b <= p.lastBand; ++b) ++bandStart_[b + 1];
   }
+  for (size_t b = 0; b < bandCount_; ++b) bandStart_[b + 1] += bandStart_[b];
+  bandItems_.resize(bandStart_[bandCount_]);
+  std::vector<size_t> fill(bandStart_.begin(), bandStart_.end() - 1);
+  for (size_t k = 0; k < pieces_.size(); ++k)
+    for (size_t b = pieces_[k].firstBand; b <= pieces_[k].lastBand; ++b) bandItems_[fill[b]++] = k;
 }
 
+double RayWinding::Low(MavikMath::BoundsT<double> const& b) const noexcept { return axis_ == 0 ? b.bottom : b.left; }
+double RayWinding::High(MavikMath::BoundsT<double> const& b) const noexcept { return axis_ == 0 ? b.top : b.right; }
+
 size_t RayWinding::Band(double y) const noexcept {
-  const double h = box_.top - box_.bottom;
+  const double lowAll = Low(box_), h = High(box_) - lowAll;
   if (!(h > 0.0)) return 0;
-  const double f = (y - box_.bottom) / h * double(bands_.size());
-  return size_t(std::clamp(f, 0.0, double(bands_.size() - 1)));
+  const double f = (y - lowAll) / h * double(bandCount_);
+  return size_t(std::clamp(f, 0.0, double(bandCount_ - 1)));
 }
 
 bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int& winding) const {
   winding = 0;
   if (!std::isfinite(q.x) || !std::isfinite(q.y)) return false;
-  if (pieces_.empty() || q.y + tolerance < box_.bottom || q.y - tolerance > box_.top) return true;
+  const double qa = Across(q, axis_), qb = Along(q, axis_);
+  if (pieces_.empty() || qa + tolerance < Low(box_) || qa - tolerance > High(box_)) return true;
   const double t2 = tolerance * tolerance;
-  const size_t lo = Band(q.y - tolerance), hi = Band(q.y + tolerance);
+  const size_t lo = Band(qa - tolerance), hi = Band(qa + tolerance);
   // A segment can sit in several bands: visit each once by its first band
   // within the query's range.
   for (size_t b = lo; b <= hi; ++b)
-    for (size_t k : bands_[b]) {
-      Piece const& s = pieces_[k];
+    for (size_t i = bandStart_[b]; i < bandStart_[b + 1]; ++i) {
+      Piece const& s = pieces_[bandItems_[i]];
       if (std::max(s.firstBand, lo) != b) continue;
       const bool own = s.points == skip;
       // Nearness: no other segment may come within the tolerance.
@@ -106,37 +131,46 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
         }
         if (!(d2 > t2)) return false;
       }
-      if (!(q.y >= s.box.bottom && q.y <= s.box.top) || s.box.left >= q.x) continue;
+      const double lowAlong = axis_ == 0 ? s.box.left : s.box.bottom;
+      if (!(qa >= Low(s.box) && qa <= High(s.box)) || lowAlong >= qb) continue;
       winding += Crossings(s, q, own ? skipT : std::numeric_limits<double>::quiet_NaN());
     }
   return true;
 }
 
 int RayWinding::Crossings(Piece const& s, V q, double skipT) const {
-  const double y = q.y;
+  const int axis = axis_;
+  const double y = Across(q, axis), qx = Along(q, axis);
+  // A crossing towards smaller values across the ray counts +1 for the ray
+  // towards -x, -1 for the ray towards -y (see the file comment).
+  const int falling = axis == 0 ? 1 : -1;
   if (!s.bezier) {
     const V a = s.points[0], b = s.points[1];
-    if ((a.y <= y) == (b.y <= y)) return 0;
-    const double t = (y - a.y) / (b.y - a.y);
+    const double ay = Across(a, axis), by = Across(b, axis);
+    if ((ay <= y) == (by <= y)) return 0;
+    const double t = (y - ay) / (by - ay);
     if (std::isfinite(skipT) && std::fabs(t - skipT) <= 1e-9) return 0;
-    const double x = a.x + t * (b.x - a.x);
-    if (!(x < q.x)) return 0;
-    return b.y < a.y ? 1 : -1;
+    const double ax = Along(a, axis);
+    const double x = ax + t * (Along(b, axis) - ax);
+    if (!(x < qx)) return 0;
+    return by < ay ? falling : -falling;
   }
   const auto pb = MavikMath::CubicBezier::GetPowerBasis(s.points);
+  const double pa = Across(pb.a, axis), pbb = Across(pb.b, axis), pc = Across(pb.c, axis), pd = Across(pb.d, axis);
   // y'(t) = 3 a t^2 + 2 b t + c: its roots (in ascending order) cut the
   // curve into monotone pieces.
   double roots[2];
-  const int nr = MavikMath::SolveQuadratic(3.0 * pb.a.y, 2.0 * pb.b.y, pb.c.y, roots);
+  const int nr = MavikMath::SolveQuadratic(3.0 * pa, 2.0 * pbb, pc, roots);
   double cuts[4] = {0.0, 0.0, 0.0, 1.0};
   int nc = 1;
   for (int r = 0; r < nr; ++r)
     if (roots[r] > 0.0 && roots[r] < 1.0) cuts[nc++] = roots[r];
   cuts[nc++] = 1.0;
+  const double y0End = Across(s.points[0], axis), y1End = Across(s.points[3], axis);
   auto yAt = [&](double t) {
-    if (t == 0.0) return s.points[0].y;
-    if (t == 1.0) return s.points[3].y;
-    return ((pb.a.y * t + pb.b.y) * t + pb.c.y) * t + pb.d.y;
+    if (t == 0.0) return y0End;
+    if (t == 1.0) return y1End;
+    return ((pa * t + pbb) * t + pc) * t + pd;
   };
   int w = 0;
   for (int k = 0; k + 1 < nc; ++k) {
@@ -155,9 +189,9 @@ int RayWinding::Crossings(Piece const& s, V q, double skipT) const {
     }
     const double t = 0.5 * (t0 + t1);
     if (std::isfinite(skipT) && std::fabs(t - skipT) <= 1e-9) continue;
-    const double x = ((pb.a.x * t + pb.b.x) * t + pb.c.x) * t + pb.d.x;
-    if (!(x < q.x)) continue;
-    w += rising ? -1 : 1;
+    const double x = ((Along(pb.a, axis) * t + Along(pb.b, axis)) * t + Along(pb.c, axis)) * t + Along(pb.d, axis);
+    if (!(x < qx)) continue;
+    w += rising ? -falling : falling;
   }
   return w;
 }

@@ -117,11 +117,11 @@ WeldStateData::WeldStateData(PolycurveT<V> const& firstIn, bool firstNonZeroIn, 
 
 WeldStateData::~WeldStateData() = default;
 
-RayWinding const& WeldStateData::Rays(bool firstOperand) const {
-  std::unique_ptr<RayWinding>& r = rays_[firstOperand ? 0 : 1];
+RayWinding const& WeldStateData::Rays(bool firstOperand, int axis) const {
+  std::unique_ptr<RayWinding>& r = rays_[firstOperand ? 0 : 1][axis == 0 ? 0 : 1];
   if (!r)
     r = std::make_unique<RayWinding>(curves, firstOperand ? 0 : size_t(firstCurveCount),
-                                     firstOperand ? size_t(firstCurveCount) : curves.size());
+                                     firstOperand ? size_t(firstCurveCount) : curves.size(), axis);
   return *r;
 }
 
@@ -255,13 +255,25 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
   // Where no other curve of the operand comes within the tolerance, the
   // winding numbers beside the edge are exact: a horizontal ray gives the one
   // just left of the place, and the edge itself, crossing the ray's line
-  // there, adds its one to the other side.
+  // there, adds its one to the other side. A horizontal edge, which that ray
+  // would run along, takes a ray downwards instead: it gives the winding
+  // just below, and the edge adds its one above.
   if (tangent.y != 0.0) {
     int w = 0;
-    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w)) {
+    if (Rays(ownFirst, 0).Winding(p, tolerance, v.points, u, w)) {
       const int beyond = w + (tangent.y < 0.0 ? 1 : -1);  // just right of the place
       // Going up, the edge has its left side towards -x.
       const int wLeft = tangent.y > 0.0 ? w : beyond, wRight = tangent.y > 0.0 ? beyond : w;
+      left = -wLeft;
+      right = wRight;
+      return true;
+    }
+  } else if (tangent.x != 0.0) {
+    int w = 0;
+    if (Rays(ownFirst, 1).Winding(p, tolerance, v.points, u, w)) {
+      const int beyond = w + (tangent.x > 0.0 ? 1 : -1);  // just above the place
+      // Going right, the edge has its left side towards +y.
+      const int wLeft = tangent.x > 0.0 ? beyond : w, wRight = tangent.x > 0.0 ? w : beyond;
       left = -wLeft;
       right = wRight;
       return true;

@@ -98,8 +98,9 @@ void CountPassage(FillStateData& state, Intersection const* crossing, double ang
 // ray_winding.cpp).
 class RayWinding {
  public:
-  // Over the segments of curves[from .. to).
-  RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to);
+  // Over the segments of curves[from .. to), for rays towards -x (axis 0)
+  // or towards -y (axis 1).
+  RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to, int axis = 0);
   // The winding number (counter-clockwise loops +1) at q, leaving out the
   // crossing of the segment whose first point is *skip at parameter skipT
   // (the segment q lies on; null for none). False, and 0, when a segment
@@ -112,12 +113,20 @@ class RayWinding {
     bool bezier = false;
     MavikMath::BoundsT<double> box;
     size_t firstBand = 0;
+    size_t lastBand = 0;
   };
-  size_t Band(double y) const noexcept;
+  // The extent of a box across the ray.
+  double Low(MavikMath::BoundsT<double> const& b) const noexcept;
+  double High(MavikMath::BoundsT<double> const& b) const noexcept;
+  size_t Band(double across) const noexcept;
   int Crossings(Piece const& s, MavikMath::V q, double skipT) const;
 
+  int axis_ = 0;
   std::vector<Piece> pieces_;
-  std::vector<std::vector<size_t>> bands_;
+  // Band b holds pieces bandItems_[bandStart_[b] .. bandStart_[b + 1]).
+  size_t bandCount_ = 0;
+  std::vector<size_t> bandStart_;
+  std::vector<size_t> bandItems_;
   MavikMath::BoundsT<double> box_;
 };
 

@@ -24,8 +24,9 @@
 //
 // The segments are sorted into bands of their boxes across the ray (one
 // flat array of segment indices per band, found by counting first), so that
-// a query visits the segments of one band: O(n) to build for n segments,
-// and per query the segments whose extent across the ray spans the place's.
+// a query visits the segments of one band: O(n) to build for n segments
+// (bands as wide as a segment's mean extent keep each in a few bands), and
+// per query the segments whose extent across the ray spans the band.
 // A query fails (the caller falls back to a probe through the engine) when
 // some segment other than the one the place lies on comes within the
 // tolerance of the place.
@@ -74,7 +75,16 @@ RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t
     }
   }
   if (pieces_.empty()) return;
-  bandCount_ = std::max<size_t>(1, pieces_.size() / 2);
+  // Bands about as wide as the mean extent of a piece across the ray: a
+  // piece then sits in about two bands (the index stays O(n)), and a band
+  // holds about twice the pieces that span its middle. At most one band per
+  // two pieces, for long thin shapes.
+  double extent = 0.0;
+  for (Piece const& p : pieces_) extent += High(p.box) - Low(p.box);
+  const double span = High(box_) - Low(box_);
+  const double maxBands = double(std::max<size_t>(1, pieces_.size() / 2));
+  const double bands = extent > 0.0 ? span * double(pieces_.size()) / extent : maxBands;
+  bandCount_ = size_t(std::clamp(bands, 1.0, maxBands));
   // Count the pieces of each band, turn the counts into offsets, then fill:
   // within a band the pieces stay in storage order.
   bandStart_.assign(bandCount_ + 1, 0);

@@ -191,12 +191,12 @@ void WeldStateData::PopulateFilledSides() {
       // Only the operand's own curves take part in the probe; if every edge
       // lies on a stretch shared with another of them (a loop drawn twice),
       // any edge will do.
-      std::vector<Edge> candidates = SafeEdges(first, SharedWith::OwnOperand, kSeedCandidates);
+      SafeEdgeList candidates = SafeEdges(first, SharedWith::OwnOperand, kSeedCandidates);
       if (candidates.empty()) candidates = SafeEdges(first, SharedWith::Nothing, kSeedCandidates);
       Edge seed;
       for (ProbePlace const& place : kProbePlan) {
-        if (place.candidate >= candidates.size()) continue;
-        Edge const& c = candidates[place.candidate];
+        if (place.candidate >= candidates.size) continue;
+        Edge const& c = candidates.edges[place.candidate];
         int l = 0, r = 0;
         const bool clean = SeedSides(c, place.fraction, ownFirst, l, r);
         if (!seed.valid() || clean) {
@@ -311,11 +311,13 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
 }
 
 Edge WeldStateData::FindNonZeroNonOverlappingEdge(Edge edge) const {
-  const std::vector<Edge> found = SafeEdges(edge, SharedWith::Anything, 0);
-  return found.empty() ? Edge{} : found.front();
+  const SafeEdgeList found = SafeEdges(edge, SharedWith::Anything, 0);
+  return found.empty() ? Edge{} : found.edges[0];
 }
 
-std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t count) const {
+WeldStateData::SafeEdgeList WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t count) const {
+  static_assert(kSeedCandidates <= kMaxSafeEdges);
+  count = std::min(count, kMaxSafeEdges);
   // The shared stretches open at the current place, counted per segment
   // (an overlap opens and closes on the same segment, so a segment starts
   // outside all of them).
@@ -326,7 +328,9 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
     const bool sameOperand = IsFirstCurve(c) == IsFirstCurve(segments->segments[size_t(r->segment)].curve);
     return sameOperand == (avoid == SharedWith::OwnOperand);
   };
-  std::vector<std::pair<double, Edge>> found;
+  SafeEdgeList out;
+  std::vector<std::pair<double, Edge>>& found = safeScratch_;
+  found.clear();
   int open = 0;
   Edge e = edge;
   for (int guard = edgeTotal + 1; e.valid() && guard > 0; --guard) {
@@ -334,7 +338,11 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
     if (counts(e.start)) open += e.start->t < e.start->overlapEnd->t ? 1 : -1;
     if (open < 0) open = 0;
     if (open == 0 && e.endT() - e.startT() > angleTolerance && !e.segment->degenerate) {
-      if (count == 0) return {e};
+      if (count == 0) {
+        out.edges[0] = e;
+        out.size = 1;
+        return out;
+      }
       found.emplace_back(MavikMath::Distance(e.pointAt(e.startT()), e.pointAt(e.endT())), e);
     }
     const Edge next = e.nextEdge();
@@ -344,8 +352,8 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
   const size_t keep = std::min(count, found.size());
   std::partial_sort(found.begin(), found.begin() + long(keep), found.end(),
                     [](auto const& a, auto const& b) { return a.first > b.first; });
-  std::vector<Edge> out;
-  for (size_t i = 0; i < keep; ++i) out.push_back(found[i].second);
+  for (size_t i = 0; i < keep; ++i) out.edges[i] = found[i].second;
+  out.size = keep;
   return out;
 }
 

@@ -60,12 +60,12 @@ FillStateData WeldStateData::SeedFillState(Edge edge) {
   // little further on, counting one crossing twice; such a ray is cast
   // again through another place, on the same or another long edge.
   Edge e;
-  const std::vector<Edge> candidates = SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates);
+  const SafeEdgeList candidates = SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates);
   const bool onFirst = IsOnFirst(edge);
   const MavikMath::BoundsT<double>& bounds = onFirst ? secondBounds : firstBounds;
   for (ProbePlace const& place : kProbePlan) {
-    if (place.candidate >= candidates.size()) continue;
-    Edge const& c = candidates[place.candidate];
+    if (place.candidate >= candidates.size) continue;
+    Edge const& c = candidates.edges[place.candidate];
     const V p = c.pointAt(c.startT() + place.fraction * (c.endT() - c.startT()));
     FillStateData found;
     bool clean = true;  // outside the other operand's box: outside it

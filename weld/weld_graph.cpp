@@ -331,6 +331,15 @@ WeldStateData::SafeEdgeList WeldStateData::SafeEdges(Edge edge, SharedWith avoid
   SafeEdgeList out;
   std::vector<std::pair<double, Edge>>& found = safeScratch_;
   found.clear();
+  // Only the `count` longest chords are kept. The selection below (a heap
+  // of the longest so far) takes a later edge only when its chord is
+  // strictly longer than the shortest it holds, which is the count-th
+  // longest so far; an edge surely shorter than that (by its squared chord,
+  // with a margin for the rounding of the exact length) would change
+  // nothing, so it is neither measured exactly nor listed. The count-th
+  // longest is tracked in `longest`, in descending order.
+  double longest[kMaxSafeEdges] = {};
+  size_t seen = 0;
   int open = 0;
   Edge e = edge;
   for (int guard = edgeTotal + 1; e.valid() && guard > 0; --guard) {
@@ -343,7 +352,23 @@ WeldStateData::SafeEdgeList WeldStateData::SafeEdges(Edge edge, SharedWith avoid
         out.size = 1;
         return out;
       }
-      found.emplace_back(MavikMath::Distance(e.pointAt(e.startT()), e.pointAt(e.endT())), e);
+      const V a = e.pointAt(e.startT()), b = e.pointAt(e.endT());
+      const double limit = seen >= count ? longest[count - 1] : 0.0;
+      if (seen < count || !(MavikMath::SquaredDistance(a, b) < limit * limit * (1.0 - 1e-9))) {
+        const double d = MavikMath::Distance(a, b);
+        found.emplace_back(d, e);
+        // Insert d into the descending list of the longest so far.
+        size_t k = std::min(seen, count);
+        if (k < count || d > longest[count - 1]) {
+          if (k == count) --k;  // the shortest of them drops out
+          while (k > 0 && longest[k - 1] < d) {
+            longest[k] = longest[k - 1];
+            --k;
+          }
+          longest[k] = d;
+        }
+        ++seen;
+      }
     }
     const Edge next = e.nextEdge();
     if (next == edge) break;

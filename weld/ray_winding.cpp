@@ -98,6 +98,18 @@ RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t
   std::vector<size_t> fill(bandStart_.begin(), bandStart_.end() - 1);
   for (size_t k = 0; k < pieces_.size(); ++k)
     for (size_t b = pieces_[k].firstBand; b <= pieces_[k].lastBand; ++b) bandItems_[fill[b]++] = k;
+  // Each band in order of where its pieces begin along the ray, so that a
+  // query stops at the first piece that begins beyond the place (plus the
+  // tolerance): nothing from there on crosses the ray or comes near.
+  // O(m log m) for the m entries of the bands.
+  for (size_t b = 0; b < bandCount_; ++b)
+    std::sort(bandItems_.begin() + long(bandStart_[b]), bandItems_.begin() + long(bandStart_[b + 1]),
+              [&](size_t x, size_t y) { return LowAlong(pieces_[x].box) < LowAlong(pieces_[y].box) ||
+                                               (LowAlong(pieces_[x].box) == LowAlong(pieces_[y].box) && x < y); });
+}
+
+double RayWinding::LowAlong(MavikMath::BoundsT<double> const& b) const noexcept {
+  return axis_ == 0 ? b.left : b.bottom;
 }
 
 double RayWinding::Low(MavikMath::BoundsT<double> const& b) const noexcept { return axis_ == 0 ? b.bottom : b.left; }
@@ -122,6 +134,8 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
   for (size_t b = lo; b <= hi; ++b)
     for (size_t i = bandStart_[b]; i < bandStart_[b + 1]; ++i) {
       Piece const& s = pieces_[bandItems_[i]];
+      const double lowAlong = LowAlong(s.box);
+      if (lowAlong > qb + tolerance) break;
       if (std::max(s.firstBand, lo) != b) continue;
       const bool own = s.points == skip;
       // Nearness: no other segment may come within the tolerance.
@@ -141,7 +155,6 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
         }
         if (!(d2 > t2)) return false;
       }
-      const double lowAlong = axis_ == 0 ? s.box.left : s.box.bottom;
       if (!(qa >= Low(s.box) && qa <= High(s.box)) || lowAlong >= qb) continue;
       winding += Crossings(s, q, own ? skipT : std::numeric_limits<double>::quiet_NaN());
     }

@@ -118,6 +118,8 @@ class RayWinding {
   // The extent of a box across the ray.
   double Low(MavikMath::BoundsT<double> const& b) const noexcept;
   double High(MavikMath::BoundsT<double> const& b) const noexcept;
+  // Where a box begins along the ray's line.
+  double LowAlong(MavikMath::BoundsT<double> const& b) const noexcept;
   size_t Band(double across) const noexcept;
   int Crossings(Piece const& s, MavikMath::V q, double skipT) const;
 

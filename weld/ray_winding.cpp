@@ -23,10 +23,12 @@
 // mirrors the plane, which turns the sign).
 //
 // The segments are sorted into bands of their boxes across the ray (one
-// flat array of segment indices per band, found by counting first), so that
-// a query visits the segments of one band: O(n) to build for n segments
-// (bands as wide as a segment's mean extent keep each in a few bands), and
-// per query the segments whose extent across the ray spans the band.
+// flat array of segment indices per band, found by counting first), built
+// for each direction of ray on its first query, so that a query visits the
+// segments of one band, in order along the ray up to the place: O(n log n)
+// to build for n segments (bands as wide as a segment's mean extent keep
+// each in a few bands), and per query the segments of the band that begin
+// before the place.
 // A query fails (the caller falls back to a probe through the engine) when
 // some segment other than the one the place lies on comes within the
 // tolerance of the place.
@@ -52,10 +54,16 @@ constexpr int kBisections = 60;  // halvings of a monotone piece: past double pr
 // one along it, for a ray towards -x (axis 0) or -y (axis 1).
 inline double Across(V const& p, int axis) noexcept { return axis == 0 ? p.y : p.x; }
 inline double Along(V const& p, int axis) noexcept { return axis == 0 ? p.x : p.y; }
+// A box's extent across the ray, and where it begins along it.
+inline double Low(MavikMath::BoundsT<double> const& b, int axis) noexcept { return axis == 0 ? b.bottom : b.left; }
+inline double High(MavikMath::BoundsT<double> const& b, int axis) noexcept { return axis == 0 ? b.top : b.right; }
+inline double LowAlong(MavikMath::BoundsT<double> const& b, int axis) noexcept {
+  return axis == 0 ? b.left : b.bottom;
+}
 
 }  // namespace
 
-RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to, int axis) : axis_(axis) {
+RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to) {
   for (size_t c = from; c < to && c < curves.size(); ++c) {
     WeldCurve const& wc = curves[c];
     if (!wc.points || !wc.nodes) continue;
@@ -74,69 +82,74 @@ RayWinding::RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t
       pieces_.push_back(s);
     }
   }
+}
+
+void RayWinding::Build(int axis) const {
+  Index& x = index_[axis];
+  x.built = true;
   if (pieces_.empty()) return;
   // Bands about as wide as the mean extent of a piece across the ray: a
   // piece then sits in about two bands (the index stays O(n)), and a band
   // holds about twice the pieces that span its middle. At most one band per
   // two pieces, for long thin shapes.
   double extent = 0.0;
-  for (Piece const& p : pieces_) extent += High(p.box) - Low(p.box);
-  const double span = High(box_) - Low(box_);
+  for (Piece const& p : pieces_) extent += High(p.box, axis) - Low(p.box, axis);
+  const double span = High(box_, axis) - Low(box_, axis);
   const double maxBands = double(std::max<size_t>(1, pieces_.size() / 2));
   const double bands = extent > 0.0 ? span * double(pieces_.size()) / extent : maxBands;
-  bandCount_ = size_t(std::clamp(bands, 1.0, maxBands));
-  // Count the pieces of each band, turn the counts into offsets, then fill:
-  // within a band the pieces stay in storage order.
-  bandStart_.assign(bandCount_ + 1, 0);
-  for (Piece& p : pieces_) {
-    p.firstBand = Band(Low(p.box));
-    p.lastBand = Band(High(p.box));
-    for (size_t b = p.firstBand; b <= p.lastBand; ++b) ++bandStart_[b + 1];
+  x.bandCount = size_t(std::clamp(bands, 1.0, maxBands));
+  // The pieces in order of where they begin along the ray (then storage
+  // order), O(n log n); filling the bands in that order leaves each band so
+  // ordered, and a query stops at the first piece that begins beyond the
+  // place (plus the tolerance): nothing from there on crosses the ray or
+  // comes near.
+  std::vector<uint32_t> order(pieces_.size());
+  for (size_t k = 0; k < order.size(); ++k) order[k] = uint32_t(k);
+  std::sort(order.begin(), order.end(), [&](uint32_t a, uint32_t b) {
+    const double la = LowAlong(pieces_[a].box, axis), lb = LowAlong(pieces_[b].box, axis);
+    return la < lb || (la == lb && a < b);
+  });
+  // Count the pieces of each band, turn the counts into offsets, then fill.
+  x.firstBand.resize(pieces_.size());
+  std::vector<uint32_t> lastBand(pieces_.size());
+  x.bandStart.assign(x.bandCount + 1, 0);
+  for (size_t k = 0; k < pieces_.size(); ++k) {
+    x.firstBand[k] = uint32_t(Band(x, Low(pieces_[k].box, axis), axis));
+    lastBand[k] = uint32_t(Band(x, High(pieces_[k].box, axis), axis));
+    for (size_t b = x.firstBand[k]; b <= lastBand[k]; ++b) ++x.bandStart[b + 1];
   }
-  for (size_t b = 0; b < bandCount_; ++b) bandStart_[b + 1] += bandStart_[b];
-  bandItems_.resize(bandStart_[bandCount_]);
-  std::vector<size_t> fill(bandStart_.begin(), bandStart_.end() - 1);
-  for (size_t k = 0; k < pieces_.size(); ++k)
-    for (size_t b = pieces_[k].firstBand; b <= pieces_[k].lastBand; ++b) bandItems_[fill[b]++] = k;
-  // Each band in order of where its pieces begin along the ray, so that a
-  // query stops at the first piece that begins beyond the place (plus the
-  // tolerance): nothing from there on crosses the ray or comes near.
-  // O(m log m) for the m entries of the bands.
-  for (size_t b = 0; b < bandCount_; ++b)
-    std::sort(bandItems_.begin() + long(bandStart_[b]), bandItems_.begin() + long(bandStart_[b + 1]),
-              [&](size_t x, size_t y) { return LowAlong(pieces_[x].box) < LowAlong(pieces_[y].box) ||
-                                               (LowAlong(pieces_[x].box) == LowAlong(pieces_[y].box) && x < y); });
+  for (size_t b = 0; b < x.bandCount; ++b) x.bandStart[b + 1] += x.bandStart[b];
+  x.items.resize(x.bandStart[x.bandCount]);
+  std::vector<uint32_t> fill(x.bandStart.begin(), x.bandStart.end() - 1);
+  for (uint32_t k : order)
+    for (size_t b = x.firstBand[k]; b <= lastBand[k]; ++b) x.items[fill[b]++] = k;
 }
 
-double RayWinding::LowAlong(MavikMath::BoundsT<double> const& b) const noexcept {
-  return axis_ == 0 ? b.left : b.bottom;
-}
-
-double RayWinding::Low(MavikMath::BoundsT<double> const& b) const noexcept { return axis_ == 0 ? b.bottom : b.left; }
-double RayWinding::High(MavikMath::BoundsT<double> const& b) const noexcept { return axis_ == 0 ? b.top : b.right; }
-
-size_t RayWinding::Band(double y) const noexcept {
-  const double lowAll = Low(box_), h = High(box_) - lowAll;
+size_t RayWinding::Band(Index const& x, double across, int axis) const noexcept {
+  const double lowAll = Low(box_, axis), h = High(box_, axis) - lowAll;
   if (!(h > 0.0)) return 0;
-  const double f = (y - lowAll) / h * double(bandCount_);
-  return size_t(std::clamp(f, 0.0, double(bandCount_ - 1)));
+  const double f = (across - lowAll) / h * double(x.bandCount);
+  return size_t(std::clamp(f, 0.0, double(x.bandCount - 1)));
 }
 
-bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int& winding) const {
+bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int& winding, int axis) const {
   winding = 0;
   if (!std::isfinite(q.x) || !std::isfinite(q.y)) return false;
-  const double qa = Across(q, axis_), qb = Along(q, axis_);
-  if (pieces_.empty() || qa + tolerance < Low(box_) || qa - tolerance > High(box_)) return true;
+  axis = axis == 0 ? 0 : 1;
+  const double qa = Across(q, axis), qb = Along(q, axis);
+  if (pieces_.empty() || qa + tolerance < Low(box_, axis) || qa - tolerance > High(box_, axis)) return true;
+  if (!index_[axis].built) Build(axis);
+  Index const& x = index_[axis];
   const double t2 = tolerance * tolerance;
-  const size_t lo = Band(qa - tolerance), hi = Band(qa + tolerance);
+  const size_t lo = Band(x, qa - tolerance, axis), hi = Band(x, qa + tolerance, axis);
   // A segment can sit in several bands: visit each once by its first band
   // within the query's range.
   for (size_t b = lo; b <= hi; ++b)
-    for (size_t i = bandStart_[b]; i < bandStart_[b + 1]; ++i) {
-      Piece const& s = pieces_[bandItems_[i]];
-      const double lowAlong = LowAlong(s.box);
-      if (lowAlong > qb + tolerance) break;
-      if (std::max(s.firstBand, lo) != b) continue;
+    for (size_t i = x.bandStart[b]; i < x.bandStart[b + 1]; ++i) {
+      const uint32_t k = x.items[i];
+      Piece const& s = pieces_[k];
+      if (LowAlong(s.box, axis) > qb + tolerance) break;
+      if (std::max(size_t(x.firstBand[k]), lo) != b) continue;
       const bool own = s.points == skip;
       // Nearness: no other segment may come within the tolerance.
       if (!own && q.x >= s.box.left - tolerance && q.x <= s.box.right + tolerance &&
@@ -155,14 +168,13 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
         }
         if (!(d2 > t2)) return false;
       }
-      if (!(qa >= Low(s.box) && qa <= High(s.box)) || lowAlong >= qb) continue;
-      winding += Crossings(s, q, own ? skipT : std::numeric_limits<double>::quiet_NaN());
+      if (!(qa >= Low(s.box, axis) && qa <= High(s.box, axis)) || LowAlong(s.box, axis) >= qb) continue;
+      winding += Crossings(s, q, own ? skipT : std::numeric_limits<double>::quiet_NaN(), axis);
     }
   return true;
 }
 
-int RayWinding::Crossings(Piece const& s, V q, double skipT) const {
-  const int axis = axis_;
+int RayWinding::Crossings(Piece const& s, V q, double skipT, int axis) {
   const double y = Across(q, axis), qx = Along(q, axis);
   // A crossing towards smaller values across the ray counts +1 for the ray
   // towards -x, -1 for the ray towards -y (see the file comment).

@@ -117,11 +117,11 @@ WeldStateData::WeldStateData(PolycurveT<V> const& firstIn, bool firstNonZeroIn, 
 
 WeldStateData::~WeldStateData() = default;
 
-RayWinding const& WeldStateData::Rays(bool firstOperand, int axis) const {
-  std::unique_ptr<RayWinding>& r = rays_[firstOperand ? 0 : 1][axis == 0 ? 0 : 1];
+RayWinding const& WeldStateData::Rays(bool firstOperand) const {
+  std::unique_ptr<RayWinding>& r = rays_[firstOperand ? 0 : 1];
   if (!r)
     r = std::make_unique<RayWinding>(curves, firstOperand ? 0 : size_t(firstCurveCount),
-                                     firstOperand ? size_t(firstCurveCount) : curves.size(), axis);
+                                     firstOperand ? size_t(firstCurveCount) : curves.size());
   return *r;
 }
 
@@ -260,7 +260,7 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
   // just below, and the edge adds its one above.
   if (tangent.y != 0.0) {
     int w = 0;
-    if (Rays(ownFirst, 0).Winding(p, tolerance, v.points, u, w)) {
+    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w, 0)) {
       const int beyond = w + (tangent.y < 0.0 ? 1 : -1);  // just right of the place
       // Going up, the edge has its left side towards -x.
       const int wLeft = tangent.y > 0.0 ? w : beyond, wRight = tangent.y > 0.0 ? beyond : w;
@@ -270,7 +270,7 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
     }
   } else if (tangent.x != 0.0) {
     int w = 0;
-    if (Rays(ownFirst, 1).Winding(p, tolerance, v.points, u, w)) {
+    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w, 1)) {
       const int beyond = w + (tangent.x > 0.0 ? 1 : -1);  // just above the place
       // Going right, the edge has its left side towards +y.
       const int wLeft = tangent.x > 0.0 ? beyond : w, wRight = tangent.x > 0.0 ? w : beyond;

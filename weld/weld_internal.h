@@ -1,6 +1,7 @@
 // Helpers shared by the source files of welding; not part of the interface.
 #pragma once
 
+#include <cstdint>
 #include <vector>
 
 #include "ostracrv/core/nodetype.h"
@@ -98,38 +99,37 @@ void CountPassage(FillStateData& state, Intersection const* crossing, double ang
 // ray_winding.cpp).
 class RayWinding {
  public:
-  // Over the segments of curves[from .. to), for rays towards -x (axis 0)
-  // or towards -y (axis 1).
-  RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to, int axis = 0);
+  // Over the segments of curves[from .. to).
+  RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to);
   // The winding number (counter-clockwise loops +1) at q, leaving out the
   // crossing of the segment whose first point is *skip at parameter skipT
-  // (the segment q lies on; null for none). False, and 0, when a segment
-  // other than that one comes within tolerance of q, or q is not finite.
-  bool Winding(MavikMath::V q, double tolerance, MavikMath::V const* skip, double skipT, int& winding) const;
+  // (the segment q lies on; null for none), by a ray towards -x (axis 0) or
+  // towards -y (axis 1). False when a segment other than that one comes
+  // within tolerance of q, or q is not finite.
+  bool Winding(MavikMath::V q, double tolerance, MavikMath::V const* skip, double skipT, int& winding,
+               int axis = 0) const;
 
  private:
   struct Piece {
     MavikMath::V const* points = nullptr;
     bool bezier = false;
     MavikMath::BoundsT<double> box;
-    size_t firstBand = 0;
-    size_t lastBand = 0;
   };
-  // The extent of a box across the ray.
-  double Low(MavikMath::BoundsT<double> const& b) const noexcept;
-  double High(MavikMath::BoundsT<double> const& b) const noexcept;
-  // Where a box begins along the ray's line.
-  double LowAlong(MavikMath::BoundsT<double> const& b) const noexcept;
-  size_t Band(double across) const noexcept;
-  int Crossings(Piece const& s, MavikMath::V q, double skipT) const;
+  // The bands of one direction of ray: band b holds pieces
+  // items[bandStart[b] .. bandStart[b + 1]), in order along the ray.
+  struct Index {
+    bool built = false;
+    size_t bandCount = 0;
+    std::vector<uint32_t> bandStart, items;
+    std::vector<uint32_t> firstBand;  // per piece
+  };
+  void Build(int axis) const;
+  size_t Band(Index const& x, double across, int axis) const noexcept;
+  static int Crossings(Piece const& s, MavikMath::V q, double skipT, int axis);
 
-  int axis_ = 0;
   std::vector<Piece> pieces_;
-  // Band b holds pieces bandItems_[bandStart_[b] .. bandStart_[b + 1]).
-  size_t bandCount_ = 0;
-  std::vector<size_t> bandStart_;
-  std::vector<size_t> bandItems_;
   MavikMath::BoundsT<double> box_;
+  mutable Index index_[2];  // built on first use
 };
 
 }  // namespace OstraCrv::weld_detail

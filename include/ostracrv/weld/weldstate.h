@@ -313,10 +313,9 @@ class WeldStateData {
   bool consistent_ = true;    // every count came back to its start round each loop
   int firstSegmentCount_ = 0;  // segments of the first operand's curves
   std::vector<MavikMath::BoundsT<double>> curveBoxes_;  // loose box of each curve, for probes
-  // Exact ray casting over each operand's curves, towards -x and towards -y,
-  // each built on first use.
-  mutable std::unique_ptr<weld_detail::RayWinding> rays_[2][2];
-  weld_detail::RayWinding const& Rays(bool firstOperand, int axis = 0) const;
+  // Exact ray casting over each operand's curves, built on first use.
+  mutable std::unique_ptr<weld_detail::RayWinding> rays_[2];
+  weld_detail::RayWinding const& Rays(bool firstOperand) const;
   int unclosedLoops_ = 0;      // loops the output walk could not close
 
   // Runs CountIntersection for every record of probe segment `s` of a probe

@@ -341,9 +341,11 @@ class WeldStateData {
   };
   SafeEdgeList SafeEdges(Edge edge, SharedWith avoid, size_t count) const;
   mutable std::vector<std::pair<double, Edge>> safeScratch_;  // SafeEdges' candidates
-  // The left and right winding of the own operand beside cur, by a probe
-  // along the normal at the given fraction of its parameter range; true
-  // when the probe met nothing but plain crossings.
+  // The left and right winding of the own operand beside cur at the given
+  // fraction of its parameter range: by an exact ray (towards -x, or -y on
+  // a horizontal edge) where no other curve of the operand comes within the
+  // tolerance, else by a probe along the normal; true for a ray, or a probe
+  // that met nothing but plain crossings.
   bool SeedSides(Edge const& cur, double fraction, bool ownFirst, int& left, int& right) const;
   std::vector<WeldCurve> ProbeCurves(V const* points, NODETYPE const* nodes, int count, bool ownFirst) const;
   // The bits of the other operand's filled sides under an overlap entry

@@ -35,6 +35,7 @@
 #include <algorithm>
 #include <cmath>
 #include <limits>
+#include <utility>
 
 #include "ostracrv/math/bezier_basis.h"
 #include "ostracrv/math/bezier_closest.h"
@@ -103,12 +104,9 @@ void RayWinding::Build(int axis) const {
   // ordered, and a query stops at the first piece that begins beyond the
   // place (plus the tolerance): nothing from there on crosses the ray or
   // comes near.
-  std::vector<uint32_t> order(pieces_.size());
-  for (size_t k = 0; k < order.size(); ++k) order[k] = uint32_t(k);
-  std::sort(order.begin(), order.end(), [&](uint32_t a, uint32_t b) {
-    const double la = LowAlong(pieces_[a].box, axis), lb = LowAlong(pieces_[b].box, axis);
-    return la < lb || (la == lb && a < b);
-  });
+  std::vector<std::pair<double, uint32_t>> order(pieces_.size());
+  for (size_t k = 0; k < order.size(); ++k) order[k] = {LowAlong(pieces_[k].box, axis), uint32_t(k)};
+  std::sort(order.begin(), order.end());
   // Count the pieces of each band, turn the counts into offsets, then fill.
   x.firstBand.resize(pieces_.size());
   std::vector<uint32_t> lastBand(pieces_.size());
@@ -121,7 +119,7 @@ void RayWinding::Build(int axis) const {
   for (size_t b = 0; b < x.bandCount; ++b) x.bandStart[b + 1] += x.bandStart[b];
   x.items.resize(x.bandStart[x.bandCount]);
   std::vector<uint32_t> fill(x.bandStart.begin(), x.bandStart.end() - 1);
-  for (uint32_t k : order)
+  for (auto const& [along, k] : order)
     for (size_t b = x.firstBand[k]; b <= lastBand[k]; ++b) x.items[fill[b]++] = k;
 }
 

@@ -50,6 +50,22 @@ int Mirror(int sides) { return ((sides & 1) << 1) | ((sides & 2) >> 1); }
 FillStateData WeldStateData::SeedFillState(Edge edge) {
   openOverlaps.clear();
   FillStateData state;
+  // A subpath whose box lies clear of the other operand's box (which has a
+  // wide margin already) meets nothing of it and has no place inside that
+  // box: whatever place were chosen below, it counts 0 and there is no
+  // record to undo. The small margin covers the rounding of a point
+  // evaluated on a curve, which lies in its control points' box.
+  const int c = edge.curve();
+  if (c >= 0 && size_t(c) < curveBoxes_.size()) {
+    MavikMath::BoundsT<double> const& box = curveBoxes_[size_t(c)];
+    MavikMath::BoundsT<double> const& other = IsOnFirst(edge) ? secondBounds : firstBounds;
+    const double mag = std::fmax(std::fmax(std::fabs(box.left), std::fabs(box.right)),
+                                 std::fmax(std::fabs(box.bottom), std::fabs(box.top)));
+    const double m = 1e-9 * (mag + 1.0);
+    if (box.right + m < other.left || other.right + m < box.left || box.top + m < other.bottom ||
+        other.top + m < box.bottom)
+      return state;
+  }
   // A safe place: on no stretch shared with the other operand (a ray ending
   // on one could not say which side it is on), and as far from the meetings
   // as the subpath allows: the middle of one of its longest free edges (a

@@ -9,13 +9,14 @@
 //     than this (squared) to the joint node is the joint found again by the
 //     clipping search, with a little rounding; dropped whatever the touch
 //     tolerance is, since at a joint the touch tolerance says nothing.
-//   kJointReach 0.25: the stretch of each of two adjacent Beziers next to
+//   kJointReach 0.1: the stretch of each of two adjacent Beziers next to
 //     their joint that is cut off before asking whether the rest of them
-//     can meet; well inside the joint distance (0.25^2 < 0.1), so that
+//     can meet; well inside the joint distance (0.1^2 < 0.1), so that
 //     whatever the clipping search finds on it is dropped.
-//   kApartRel 1e-6: how far apart, relative to the coordinates' magnitude,
-//     the rest of the two must lie: far beyond the closeness (1e-10 of the
-//     magnitude) at which the clipping search takes two curves for meeting.
+//   kApartRel 1e-9: how far apart, relative to the coordinates' magnitude,
+//     the rest of the two must lie: five times the closeness (at most twice
+//     1e-10 of the magnitude) at which the clipping search takes two curves
+//     for meeting.
 //
 // The Bezier searches write into lists; these are scratch buffers of the
 // calling thread, kept between calls, so a pair test allocates nothing but
@@ -43,8 +44,8 @@ using Framework::common_types::POINT;
 
 constexpr double kJointParameter = 1e-7;
 constexpr double kJointDistanceSquared = 0.1;
-constexpr double kJointReach = 0.25;
-constexpr double kApartRel = 1e-6;
+constexpr double kJointReach = 0.1;
+constexpr double kApartRel = 1e-9;
 
 enum class PairKind { Lines, LineBezier, Beziers };
 
@@ -110,7 +111,8 @@ bool AddLineBezierCrossings(const SegmentGeometry& A, const SegmentGeometry& B, 
 // the boxes of the rest of both must lie apart by more than kApartRel of
 // the magnitude. A meeting the search reports has a point on each curve
 // closer than that: on the rests it cannot be, so it lies within the
-// reach (plus that closeness) of the joint, and is dropped. Then the
+// reach (plus that closeness) of the joint, and is dropped. (Pairs of
+// flat curves, which the search answers otherwise, are left to it.) Then the
 // search, the costliest step at a smooth node, where the curves touch
 // tangentially, need not run. O(1).
 bool MeetOnlyAtJoint(const SegmentGeometry& A, const SegmentGeometry& B, JointType joint) {
@@ -125,6 +127,28 @@ bool MeetOnlyAtJoint(const SegmentGeometry& A, const SegmentGeometry& B, JointTy
   const double apart = kApartRel * (mag + 1.0);
   if (!std::isfinite(mag) || !((kJointReach + apart) * (kJointReach + apart) < 0.9 * kJointDistanceSquared))
     return false;
+  // The search answers curves whose control points all lie along one line
+  // by a projection that need not report points close to both curves:
+  // such a pair is always searched. A curve is flat here when its control
+  // points lie within apart of the line through the farthest two of them,
+  // which holds for each curve of every pair the search takes for collinear.
+  auto flat = [&](const V* p) {
+    int bi = 0, bj = 1;
+    double best = -1.0;
+    for (int i = 0; i < 4; ++i)
+      for (int j = i + 1; j < 4; ++j)
+        if (const double d = SquaredDistance(p[i], p[j]); d > best) {
+          best = d;
+          bi = i;
+          bj = j;
+        }
+    if (!(best > 0.0)) return true;
+    const D u = (p[bj] - p[bi]) * (1.0 / std::sqrt(best));
+    for (int i = 0; i < 4; ++i)
+      if (!(std::fabs(Cross(u, p[i] - p[bi])) <= apart)) return false;
+    return true;
+  };
+  if (flat(in) || flat(out)) return false;
   auto width = [](const V* p) {
     double leg = 0.0;
     for (int i = 0; i < 3; ++i) leg = std::fmax(leg, MavikMath::Distance(p[i], p[i + 1]));

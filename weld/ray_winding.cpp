@@ -27,11 +27,10 @@
 // for each direction of ray on its first query, so that a query visits the
 // segments of one band, in order along the ray up to the place: O(n log n)
 // to build for n segments (bands as wide as a segment's mean extent keep
-// each in a few bands), and per query the segments of the band that begin
-// before the place.
-// A query fails (the caller falls back to a probe through the engine) when
-// some segment other than the one the place lies on comes within the
-// tolerance of the place.
+// each in a few bands on average), and per query the segments of the band
+// that begin before the place. A query fails (the caller falls back to a
+// probe through the engine) when some segment other than the one the place
+// lies on comes within the tolerance of the place.
 #include <algorithm>
 #include <cmath>
 #include <limits>

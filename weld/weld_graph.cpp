@@ -331,13 +331,14 @@ WeldStateData::SafeEdgeList WeldStateData::SafeEdges(Edge edge, SharedWith avoid
   SafeEdgeList out;
   std::vector<std::pair<double, Edge>>& found = safeScratch_;
   found.clear();
-  // Only the `count` longest chords are kept. The selection below (a heap
-  // of the longest so far) takes a later edge only when its chord is
-  // strictly longer than the shortest it holds, which is the count-th
-  // longest so far; an edge surely shorter than that (by its squared chord,
-  // with a margin for the rounding of the exact length) would change
-  // nothing, so it is neither measured exactly nor listed. The count-th
-  // longest is tracked in `longest`, in descending order.
+  // Only the `count` longest chords are kept. The partial sort below (a
+  // heap selection in the standard library we build with) takes a later
+  // edge only when its chord is strictly longer than the shortest it holds,
+  // the count-th longest so far; an edge surely shorter than that (by its
+  // squared chord, with a margin for the rounding of the exact length)
+  // changes nothing, not even the order among equal chords, so it is
+  // neither measured exactly nor listed. The count-th longest is tracked in
+  // `longest`, in descending order. O(edges of the subpath).
   double longest[kMaxSafeEdges] = {};
   size_t seen = 0;
   int open = 0;

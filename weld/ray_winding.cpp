@@ -25,10 +25,11 @@
 // The segments are sorted into bands of their boxes across the ray (one
 // flat array of segment indices per band, found by counting first), built
 // for each direction of ray on its first query, so that a query visits the
-// segments of one band, in order along the ray up to the place: O(n log n)
-// to build for n segments (bands as wide as a segment's mean extent keep
-// each in a few bands on average), and per query the segments of the band
-// that begin before the place. A query fails (the caller falls back to a
+// segments of one band, in order along the ray up to the place: O(n) to
+// build for n segments (bands as wide as a segment's mean extent keep each
+// in a few bands on average), O(m log m) to order a band of m segments on
+// its first visit, and per query the segments of the band that begin
+// before the place. A query fails (the caller falls back to a
 // probe through the engine) when some segment other than the one the place
 // lies on comes within the tolerance of the place.
 #include <algorithm>
@@ -98,15 +99,9 @@ void RayWinding::Build(int axis) const {
   const double maxBands = double(std::max<size_t>(1, pieces_.size() / 2));
   const double bands = extent > 0.0 ? span * double(pieces_.size()) / extent : maxBands;
   x.bandCount = size_t(std::clamp(bands, 1.0, maxBands));
-  // The pieces in order of where they begin along the ray (then storage
-  // order), O(n log n); filling the bands in that order leaves each band so
-  // ordered, and a query stops at the first piece that begins beyond the
-  // place (plus the tolerance): nothing from there on crosses the ray or
-  // comes near.
-  std::vector<std::pair<double, uint32_t>> order(pieces_.size());
-  for (size_t k = 0; k < order.size(); ++k) order[k] = {LowAlong(pieces_[k].box, axis), uint32_t(k)};
-  std::sort(order.begin(), order.end());
-  // Count the pieces of each band, turn the counts into offsets, then fill.
+  // Count the pieces of each band, turn the counts into offsets, then fill
+  // in storage order. A band is put in order along the ray when a query
+  // first visits it (see Winding).
   x.firstBand.resize(pieces_.size());
   std::vector<uint32_t> lastBand(pieces_.size());
   x.bandStart.assign(x.bandCount + 1, 0);
@@ -118,8 +113,9 @@ void RayWinding::Build(int axis) const {
   for (size_t b = 0; b < x.bandCount; ++b) x.bandStart[b + 1] += x.bandStart[b];
   x.items.resize(x.bandStart[x.bandCount]);
   std::vector<uint32_t> fill(x.bandStart.begin(), x.bandStart.end() - 1);
-  for (auto const& [along, k] : order)
+  for (uint32_t k = 0; k < uint32_t(pieces_.size()); ++k)
     for (size_t b = x.firstBand[k]; b <= lastBand[k]; ++b) x.items[fill[b]++] = k;
+  x.sorted.assign(x.bandCount, 0);
 }
 
 size_t RayWinding::Band(Index const& x, double across, int axis) const noexcept {
@@ -136,12 +132,25 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
   const double qa = Across(q, axis), qb = Along(q, axis);
   if (pieces_.empty() || qa + tolerance < Low(box_, axis) || qa - tolerance > High(box_, axis)) return true;
   if (!index_[axis].built) Build(axis);
-  Index const& x = index_[axis];
+  Index& x = index_[axis];
   const double t2 = tolerance * tolerance;
   const size_t lo = Band(x, qa - tolerance, axis), hi = Band(x, qa + tolerance, axis);
   // A segment can sit in several bands: visit each once by its first band
   // within the query's range.
-  for (size_t b = lo; b <= hi; ++b)
+  for (size_t b = lo; b <= hi; ++b) {
+    if (!x.sorted[b]) {
+      // In order of where the pieces begin along the ray (then storage
+      // order), O(m log m) for the m pieces of the band, once: a query then
+      // stops at the first piece that begins beyond the place (plus the
+      // tolerance), since nothing from there on crosses the ray or comes
+      // near. Only the bands that queries visit are sorted.
+      x.sorted[b] = 1;
+      std::sort(x.items.begin() + long(x.bandStart[b]), x.items.begin() + long(x.bandStart[b + 1]),
+                [&](uint32_t p, uint32_t q) {
+                  const double lp = LowAlong(pieces_[p].box, axis), lq = LowAlong(pieces_[q].box, axis);
+                  return lp < lq || (lp == lq && p < q);
+                });
+    }
     for (size_t i = x.bandStart[b]; i < x.bandStart[b + 1]; ++i) {
       const uint32_t k = x.items[i];
       Piece const& s = pieces_[k];
@@ -168,6 +177,7 @@ bool RayWinding::Winding(V q, double tolerance, V const* skip, double skipT, int
       if (!(qa >= Low(s.box, axis) && qa <= High(s.box, axis)) || LowAlong(s.box, axis) >= qb) continue;
       winding += Crossings(s, q, own ? skipT : std::numeric_limits<double>::quiet_NaN(), axis);
     }
+  }
   return true;
 }
 

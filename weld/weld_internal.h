@@ -116,12 +116,14 @@ class RayWinding {
     MavikMath::BoundsT<double> box;
   };
   // The bands of one direction of ray: band b holds pieces
-  // items[bandStart[b] .. bandStart[b + 1]), in order along the ray.
+  // items[bandStart[b] .. bandStart[b + 1]), in order along the ray once
+  // sorted[b] is set.
   struct Index {
     bool built = false;
     size_t bandCount = 0;
     std::vector<uint32_t> bandStart, items;
     std::vector<uint32_t> firstBand;  // per piece
+    std::vector<char> sorted;         // per band: put in order along the ray
   };
   void Build(int axis) const;
   size_t Band(Index const& x, double across, int axis) const noexcept;

@@ -5,10 +5,11 @@
 // a shape with many holes against a rectangle cutting through them).
 //
 // The graph costs O(s log s + k) for s segments and k meetings, the weld pass
-// O(edges) plus one probe per subpath, the output O(edges): the time per
-// segment should stay nearly flat for one outline, and grow with the number
-// of subpaths when there are many (each probe passes the curves whose boxes
-// it meets).
+// O(edges) plus one exact ray per subpath (a probe through the engine only
+// where a curve passes within the tolerance of the place), the output
+// O(edges): the time per segment should stay nearly flat for one outline,
+// and grow slowly with the number of subpaths when there are many (each ray
+// passes the segments of its band up to the place).
 #include <benchmark/benchmark.h>
 
 #include <cmath>

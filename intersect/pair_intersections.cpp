@@ -9,6 +9,14 @@
 //     than this (squared) to the joint node is the joint found again by the
 //     clipping search, with a little rounding; dropped whatever the touch
 //     tolerance is, since at a joint the touch tolerance says nothing.
+//   kJointReach 0.1: the stretch of each of two adjacent Beziers next to
+//     their joint that is cut off before asking whether the rest of them
+//     can meet; well inside the joint distance (0.1^2 < 0.1), so that
+//     whatever the clipping search finds on it is dropped.
+//   kApartRel 1e-9: how far apart, relative to the coordinates' magnitude,
+//     the rest of the two must lie: five times the closeness (at most twice
+//     1e-10 of the magnitude) at which the clipping search takes two curves
+//     for meeting.
 //
 // The Bezier searches write into lists; these are scratch buffers of the
 // calling thread, kept between calls, so a pair test allocates nothing but
@@ -24,6 +32,8 @@
 #include "ostracrv/math/bezier_intersect.h"
 #include "ostracrv/math/bezier_line_intersect.h"
 #include "ostracrv/math/bezier_self_intersect.h"
+#include "ostracrv/math/bezier_split.h"
+#include "ostracrv/math/rect.h"
 
 namespace OstraCrv {
 
@@ -34,6 +44,8 @@ using Framework::common_types::POINT;
 
 constexpr double kJointParameter = 1e-7;
 constexpr double kJointDistanceSquared = 0.1;
+constexpr double kJointReach = 0.1;
+constexpr double kApartRel = 1e-9;
 
 enum class PairKind { Lines, LineBezier, Beziers };
 
@@ -91,11 +103,84 @@ bool AddLineBezierCrossings(const SegmentGeometry& A, const SegmentGeometry& B, 
   return crossed;
 }
 
+// Whether two Beziers joined end to start (joint JointFirstToSecond or
+// JointSecondToFirst) can meet only near their joint node, where every
+// meeting the clipping search reports is dropped. Each is cut where it stays
+// within kJointReach of the joint from there on (a stretch of parameter
+// width w moves at most w times three times its longest control leg), and
+// the boxes of the rest of both must lie apart by more than kApartRel of
+// the magnitude. A meeting the search reports has a point on each curve
+// closer than that: on the rests it cannot be, so it lies within the
+// reach (plus that closeness) of the joint, and is dropped. (Pairs of
+// flat curves, which the search answers otherwise, are left to it.) Then the
+// search, the costliest step at a smooth node, where the curves touch
+// tangentially, need not run. O(1).
+bool MeetOnlyAtJoint(const SegmentGeometry& A, const SegmentGeometry& B, JointType joint) {
+  if (joint != JointFirstToSecond && joint != JointSecondToFirst) return false;
+  // The curve ending at the joint, and the one starting there.
+  const V* in = joint == JointFirstToSecond ? A.p : B.p;
+  const V* out = joint == JointFirstToSecond ? B.p : A.p;
+  double mag = 0.0;
+  for (int i = 0; i < 4; ++i)
+    mag = std::fmax(mag, std::fmax(std::fmax(std::fabs(in[i].x), std::fabs(in[i].y)),
+                                   std::fmax(std::fabs(out[i].x), std::fabs(out[i].y))));
+  const double apart = kApartRel * (mag + 1.0);
+  if (!std::isfinite(mag) || !((kJointReach + apart) * (kJointReach + apart) < 0.9 * kJointDistanceSquared))
+    return false;
+  // The search answers curves whose control points all lie along one line
+  // by a projection that need not report points close to both curves:
+  // such a pair is always searched. A curve is flat here when its control
+  // points lie within apart of the line through the farthest two of them,
+  // which holds for each curve of every pair the search takes for collinear.
+  auto flat = [&](const V* p) {
+    int bi = 0, bj = 1;
+    double best = -1.0;
+    for (int i = 0; i < 4; ++i)
+      for (int j = i + 1; j < 4; ++j)
+        if (const double d = SquaredDistance(p[i], p[j]); d > best) {
+          best = d;
+          bi = i;
+          bj = j;
+        }
+    if (!(best > 0.0)) return true;
+    const D u = (p[bj] - p[bi]) * (1.0 / std::sqrt(best));
+    for (int i = 0; i < 4; ++i)
+      if (!(std::fabs(Cross(u, p[i] - p[bi])) <= apart)) return false;
+    return true;
+  };
+  if (flat(in) || flat(out)) return false;
+  auto width = [](const V* p) {
+    double leg = 0.0;
+    for (int i = 0; i < 3; ++i) leg = std::fmax(leg, MavikMath::Distance(p[i], p[i + 1]));
+    return leg > 0.0 ? std::fmin(0.5, kJointReach / (3.0 * leg)) : 0.0;
+  };
+  const double wIn = width(in), wOut = width(out);
+  if (!(wIn > 0.0) || !(wOut > 0.0)) return false;
+  V inNear[4], inRest[4], outNear[4], outRest[4];
+  MavikMath::CubicBezier::Subsection(1.0 - wIn, 1.0, in, inNear);
+  MavikMath::CubicBezier::Subsection(0.0, 1.0 - wIn, in, inRest);
+  MavikMath::CubicBezier::Subsection(0.0, wOut, out, outNear);
+  MavikMath::CubicBezier::Subsection(wOut, 1.0, out, outRest);
+  // The cut-off stretches lie in the hulls of their control points.
+  const double reach2 = kJointReach * kJointReach;
+  for (int i = 0; i < 4; ++i)
+    if (!(SquaredDistance(inNear[i], in[3]) <= reach2) || !(SquaredDistance(outNear[i], out[0]) <= reach2))
+      return false;
+  MavikMath::BoundsT<double> a, b;
+  for (int i = 0; i < 4; ++i) {
+    a.Add(inRest[i]);
+    b.Add(outRest[i]);
+  }
+  return a.right + apart < b.left || b.right + apart < a.left || a.top + apart < b.bottom ||
+         b.top + apart < a.bottom;
+}
+
 // Crossings of two Beziers, away from the joint node and outside the shared
 // stretch `overlap` (if any).
 template <class T>
 bool AddBezierCrossings(const SegmentGeometry& A, const SegmentGeometry& B, int a, int b, SegmentsT<T>& segments,
                         JointType joint, const SegmentIntersectionSettings& settings, const Intersection* overlap) {
+  if (MeetOnlyAtJoint(A, B, joint)) return false;
   Scratch& s = GetScratch();
   MavikMath::CubicBezier::FindBezierIntersections(A.p, B.p, s.ta, s.tb, s.points);
   const double tts = settings.touchToleranceSquared;

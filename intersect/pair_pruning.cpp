@@ -130,8 +130,12 @@ class Hierarchy {
     }
     const bool alongX = hx - lx >= hy - ly;
     const int mid = begin + (end - begin) / 2;
-    std::nth_element(items_.begin() + begin, items_.begin() + mid, items_.begin() + end,
-                     [alongX](const Item& p, const Item& q) { return alongX ? p.cx < q.cx : p.cy < q.cy; });
+    if (alongX)
+      std::nth_element(items_.begin() + begin, items_.begin() + mid, items_.begin() + end,
+                       [](const Item& p, const Item& q) { return p.cx < q.cx; });
+    else
+      std::nth_element(items_.begin() + begin, items_.begin() + mid, items_.begin() + end,
+                       [](const Item& p, const Item& q) { return p.cy < q.cy; });
     const int left = Build(begin, mid);
     const int right = Build(mid, end);
     nodes_[index].left = left;
@@ -155,6 +159,7 @@ void CollectSegmentPairs(const SegmentsT<T>& s, const SegmentIntersectionSetting
   std::vector<SegmentBox> boxes(n);
   std::vector<Item> drivers;
   std::vector<int> targets;
+  drivers.reserve(size_t(n));
   bool centresFinite = true;
   for (int j = 0; j < n; ++j) {
     const SegmentIntersections& seg = s.segments[j];

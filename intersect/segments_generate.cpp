@@ -190,7 +190,12 @@ void SegmentsT<T>::GenerateIntersections(const SegmentIntersectionSettings& sett
   overlapCount = 0;
   for (auto& c : curves) c.intersectsWith.clear();
 
-  // 2. Segments, curve after curve.
+  // 2. Segments, curve after curve. A curve of n nodes has at most n - 1
+  // segments: room for them all up front spares the moves of regrowing.
+  size_t most = 0;
+  for (const auto& c : curves)
+    if (c.count > 1) most += static_cast<size_t>(c.count - 1);
+  segments.reserve(most);
   for (int k = 0; k < static_cast<int>(curves.size()); ++k)
     InitializeSegments(k, curves[k].points, curves[k].nodes, curves[k].count, segments);
 

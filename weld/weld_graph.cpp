@@ -191,12 +191,12 @@ void WeldStateData::PopulateFilledSides() {
       // Only the operand's own curves take part in the probe; if every edge
       // lies on a stretch shared with another of them (a loop drawn twice),
       // any edge will do.
-      std::vector<Edge> candidates = SafeEdges(first, SharedWith::OwnOperand, kSeedCandidates);
+      SafeEdgeList candidates = SafeEdges(first, SharedWith::OwnOperand, kSeedCandidates);
       if (candidates.empty()) candidates = SafeEdges(first, SharedWith::Nothing, kSeedCandidates);
       Edge seed;
       for (ProbePlace const& place : kProbePlan) {
-        if (place.candidate >= candidates.size()) continue;
-        Edge const& c = candidates[place.candidate];
+        if (place.candidate >= candidates.size) continue;
+        Edge const& c = candidates.edges[place.candidate];
         int l = 0, r = 0;
         const bool clean = SeedSides(c, place.fraction, ownFirst, l, r);
         if (!seed.valid() || clean) {
@@ -255,13 +255,25 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
   // Where no other curve of the operand comes within the tolerance, the
   // winding numbers beside the edge are exact: a horizontal ray gives the one
   // just left of the place, and the edge itself, crossing the ray's line
-  // there, adds its one to the other side.
+  // there, adds its one to the other side. A horizontal edge, which that ray
+  // would run along, takes a ray downwards instead: it gives the winding
+  // just below, and the edge adds its one above.
   if (tangent.y != 0.0) {
     int w = 0;
-    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w)) {
+    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w, 0)) {
       const int beyond = w + (tangent.y < 0.0 ? 1 : -1);  // just right of the place
       // Going up, the edge has its left side towards -x.
       const int wLeft = tangent.y > 0.0 ? w : beyond, wRight = tangent.y > 0.0 ? beyond : w;
+      left = -wLeft;
+      right = wRight;
+      return true;
+    }
+  } else if (tangent.x != 0.0) {
+    int w = 0;
+    if (Rays(ownFirst).Winding(p, tolerance, v.points, u, w, 1)) {
+      const int beyond = w + (tangent.x > 0.0 ? 1 : -1);  // just above the place
+      // Going right, the edge has its left side towards +y.
+      const int wLeft = tangent.x > 0.0 ? beyond : w, wRight = tangent.x > 0.0 ? w : beyond;
       left = -wLeft;
       right = wRight;
       return true;
@@ -299,11 +311,13 @@ bool WeldStateData::SeedSides(Edge const& cur, double fraction, bool ownFirst, i
 }
 
 Edge WeldStateData::FindNonZeroNonOverlappingEdge(Edge edge) const {
-  const std::vector<Edge> found = SafeEdges(edge, SharedWith::Anything, 0);
-  return found.empty() ? Edge{} : found.front();
+  const SafeEdgeList found = SafeEdges(edge, SharedWith::Anything, 0);
+  return found.empty() ? Edge{} : found.edges[0];
 }
 
-std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t count) const {
+WeldStateData::SafeEdgeList WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t count) const {
+  static_assert(kSeedCandidates <= kMaxSafeEdges);
+  count = std::min(count, kMaxSafeEdges);
   // The shared stretches open at the current place, counted per segment
   // (an overlap opens and closes on the same segment, so a segment starts
   // outside all of them).
@@ -314,7 +328,19 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
     const bool sameOperand = IsFirstCurve(c) == IsFirstCurve(segments->segments[size_t(r->segment)].curve);
     return sameOperand == (avoid == SharedWith::OwnOperand);
   };
-  std::vector<std::pair<double, Edge>> found;
+  SafeEdgeList out;
+  std::vector<std::pair<double, Edge>>& found = safeScratch_;
+  found.clear();
+  // Only the `count` longest chords are kept. The partial sort below (a
+  // heap selection in the standard library we build with) takes a later
+  // edge only when its chord is strictly longer than the shortest it holds,
+  // the count-th longest so far; an edge surely shorter than that (by its
+  // squared chord, with a margin for the rounding of the exact length)
+  // changes nothing, not even the order among equal chords, so it is
+  // neither measured exactly nor listed. The count-th longest is tracked in
+  // `longest`, in descending order. O(edges of the subpath).
+  double longest[kMaxSafeEdges] = {};
+  size_t seen = 0;
   int open = 0;
   Edge e = edge;
   for (int guard = edgeTotal + 1; e.valid() && guard > 0; --guard) {
@@ -322,8 +348,28 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
     if (counts(e.start)) open += e.start->t < e.start->overlapEnd->t ? 1 : -1;
     if (open < 0) open = 0;
     if (open == 0 && e.endT() - e.startT() > angleTolerance && !e.segment->degenerate) {
-      if (count == 0) return {e};
-      found.emplace_back(MavikMath::Distance(e.pointAt(e.startT()), e.pointAt(e.endT())), e);
+      if (count == 0) {
+        out.edges[0] = e;
+        out.size = 1;
+        return out;
+      }
+      const V a = e.pointAt(e.startT()), b = e.pointAt(e.endT());
+      const double limit = seen >= count ? longest[count - 1] : 0.0;
+      if (seen < count || !(MavikMath::SquaredDistance(a, b) < limit * limit * (1.0 - 1e-9))) {
+        const double d = MavikMath::Distance(a, b);
+        found.emplace_back(d, e);
+        // Insert d into the descending list of the longest so far.
+        size_t k = std::min(seen, count);
+        if (k < count || d > longest[count - 1]) {
+          if (k == count) --k;  // the shortest of them drops out
+          while (k > 0 && longest[k - 1] < d) {
+            longest[k] = longest[k - 1];
+            --k;
+          }
+          longest[k] = d;
+        }
+        ++seen;
+      }
     }
     const Edge next = e.nextEdge();
     if (next == edge) break;
@@ -332,8 +378,8 @@ std::vector<Edge> WeldStateData::SafeEdges(Edge edge, SharedWith avoid, size_t c
   const size_t keep = std::min(count, found.size());
   std::partial_sort(found.begin(), found.begin() + long(keep), found.end(),
                     [](auto const& a, auto const& b) { return a.first > b.first; });
-  std::vector<Edge> out;
-  for (size_t i = 0; i < keep; ++i) out.push_back(found[i].second);
+  for (size_t i = 0; i < keep; ++i) out.edges[i] = found[i].second;
+  out.size = keep;
   return out;
 }
 

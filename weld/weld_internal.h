@@ -1,6 +1,7 @@
 // Helpers shared by the source files of welding; not part of the interface.
 #pragma once
 
+#include <cstdint>
 #include <vector>
 
 #include "ostracrv/core/nodetype.h"
@@ -102,23 +103,35 @@ class RayWinding {
   RayWinding(std::vector<WeldCurve> const& curves, size_t from, size_t to);
   // The winding number (counter-clockwise loops +1) at q, leaving out the
   // crossing of the segment whose first point is *skip at parameter skipT
-  // (the segment q lies on; null for none). False, and 0, when a segment
-  // other than that one comes within tolerance of q, or q is not finite.
-  bool Winding(MavikMath::V q, double tolerance, MavikMath::V const* skip, double skipT, int& winding) const;
+  // (the segment q lies on; null for none), by a ray towards -x (axis 0) or
+  // towards -y (axis 1). False when a segment other than that one comes
+  // within tolerance of q, or q is not finite.
+  bool Winding(MavikMath::V q, double tolerance, MavikMath::V const* skip, double skipT, int& winding,
+               int axis = 0) const;
 
  private:
   struct Piece {
     MavikMath::V const* points = nullptr;
     bool bezier = false;
     MavikMath::BoundsT<double> box;
-    size_t firstBand = 0;
   };
-  size_t Band(double y) const noexcept;
-  int Crossings(Piece const& s, MavikMath::V q, double skipT) const;
+  // The bands of one direction of ray: band b holds pieces
+  // items[bandStart[b] .. bandStart[b + 1]), in order along the ray once
+  // sorted[b] is set.
+  struct Index {
+    bool built = false;
+    size_t bandCount = 0;
+    std::vector<uint32_t> bandStart, items;
+    std::vector<uint32_t> firstBand;  // per piece
+    std::vector<char> sorted;         // per band: put in order along the ray
+  };
+  void Build(int axis) const;
+  size_t Band(Index const& x, double across, int axis) const noexcept;
+  static int Crossings(Piece const& s, MavikMath::V q, double skipT, int axis);
 
   std::vector<Piece> pieces_;
-  std::vector<std::vector<size_t>> bands_;
   MavikMath::BoundsT<double> box_;
+  mutable Index index_[2];  // built on first use
 };
 
 }  // namespace OstraCrv::weld_detail

@@ -8,6 +8,7 @@
 // small and double arithmetic on products of coordinates keeps about 1e-8
 // units of precision.
 #include <cmath>
+#include <memory>
 #include <utility>
 
 #include "ostracrv/core/polycurve.h"
@@ -65,19 +66,41 @@ PolycurveT<T> Weld(PolycurveT<T> const& first, PolycurveT<T> const& second, bool
                    WeldFlags flags, WeldKeepRule rule) {
   const PolycurveT<V> a = Widened(first), b = Widened(second);
   // An attempt is sound when every count came back to its start round its
-  // loop and every loop closed.
+  // loop and every loop closed. One whose counts did not come back is not
+  // sound whatever its loops do: its output is needed only if no later
+  // attempt is sound, so it is generated only then (its graph is kept
+  // meanwhile), and a sound retry costs no output walk of the failed graph.
+  // A graph found inconsistent while its sides are filled is not welded
+  // either until then.
   struct Attempt {
+    std::unique_ptr<WeldStateData> pending;  // graph whose output is not yet walked
+    bool welded = false;                     // PerformWeld has run on it
     PolycurveT<T> result;
     bool sound = false;
     bool closed = false;
   };
+  auto finish = [&](Attempt& at) {
+    if (!at.pending) return;
+    if (!at.welded) at.pending->PerformWeld(rule);
+    at.result = at.pending->template GenerateOutputCurve<T>(false);
+    at.closed = at.pending->UnclosedLoops() == 0;
+    at.sound = false;
+    at.pending.reset();
+  };
   auto run = [&](PolycurveT<V> const& x, PolycurveT<V> const& y, WeldFlags f) {
-    WeldStateData state(x, firstNonZero, y, secondNonZero, false, false, f);
-    state.PerformWeld(rule);
+    auto state = std::make_unique<WeldStateData>(x, firstNonZero, y, secondNonZero, false, false, f);
     Attempt at;
-    at.result = state.GenerateOutputCurve<T>(false);
-    at.closed = state.UnclosedLoops() == 0;
-    at.sound = state.IsConsistent() && at.closed;
+    if (state->IsConsistent()) {
+      state->PerformWeld(rule);
+      at.welded = true;
+    }
+    if (!state->IsConsistent()) {
+      at.pending = std::move(state);
+      return at;
+    }
+    at.result = state->GenerateOutputCurve<T>(false);
+    at.closed = state->UnclosedLoops() == 0;
+    at.sound = at.closed;
     return at;
   };
   // Where curves pass within the weld tolerance of each other's nodes, the
@@ -94,8 +117,16 @@ PolycurveT<T> Weld(PolycurveT<T> const& first, PolycurveT<T> const& second, bool
   Attempt best = run(a, b, flags);
   if (best.sound) return best.result;
   auto consider = [&](Attempt&& at) {
-    if (at.sound || (at.closed && !best.closed)) best = std::move(at);
-    return best.sound;
+    if (at.sound) {
+      best = std::move(at);
+      return true;
+    }
+    // Only the first attempt, whose operands outlive every other, may stay
+    // pending: a later one is walked here.
+    finish(at);
+    finish(best);
+    if (at.closed && !best.closed) best = std::move(at);
+    return false;
   };
   if (!precise && consider(run(a, b, flags | WeldFlags::Precise))) return best.result;
   const double collapse = precise ? kPreciseCollapse * Extent(a, b) : kWeldTolerance;
@@ -107,6 +138,7 @@ PolycurveT<T> Weld(PolycurveT<T> const& first, PolycurveT<T> const& second, bool
       if (!precise && consider(run(ca, cb, flags | WeldFlags::Precise))) return best.result;
     }
   }
+  finish(best);
   if (!best.closed) CloseAll(best.result);
   return best.result;
 }

@@ -50,6 +50,22 @@ int Mirror(int sides) { return ((sides & 1) << 1) | ((sides & 2) >> 1); }
 FillStateData WeldStateData::SeedFillState(Edge edge) {
   openOverlaps.clear();
   FillStateData state;
+  // A subpath whose box lies clear of the other operand's box (which has a
+  // wide margin already) meets nothing of it and has no place inside that
+  // box: whatever place were chosen below, it counts 0 and there is no
+  // record to undo. The small margin covers the rounding of a point
+  // evaluated on a curve, which lies in its control points' box.
+  const int c = edge.curve();
+  if (c >= 0 && size_t(c) < curveBoxes_.size()) {
+    MavikMath::BoundsT<double> const& box = curveBoxes_[size_t(c)];
+    MavikMath::BoundsT<double> const& other = IsOnFirst(edge) ? secondBounds : firstBounds;
+    const double mag = std::fmax(std::fmax(std::fabs(box.left), std::fabs(box.right)),
+                                 std::fmax(std::fabs(box.bottom), std::fabs(box.top)));
+    const double m = 1e-9 * (mag + 1.0);
+    if (box.right + m < other.left || other.right + m < box.left || box.top + m < other.bottom ||
+        other.top + m < box.bottom)
+      return state;
+  }
   // A safe place: on no stretch shared with the other operand (a ray ending
   // on one could not say which side it is on), and as far from the meetings
   // as the subpath allows: the middle of one of its longest free edges (a
@@ -60,12 +76,12 @@ FillStateData WeldStateData::SeedFillState(Edge edge) {
   // little further on, counting one crossing twice; such a ray is cast
   // again through another place, on the same or another long edge.
   Edge e;
-  const std::vector<Edge> candidates = SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates);
+  const SafeEdgeList candidates = SafeEdges(edge, SharedWith::OtherOperand, kSeedCandidates);
   const bool onFirst = IsOnFirst(edge);
   const MavikMath::BoundsT<double>& bounds = onFirst ? secondBounds : firstBounds;
   for (ProbePlace const& place : kProbePlan) {
-    if (place.candidate >= candidates.size()) continue;
-    Edge const& c = candidates[place.candidate];
+    if (place.candidate >= candidates.size) continue;
+    Edge const& c = candidates.edges[place.candidate];
     const V p = c.pointAt(c.startT() + place.fraction * (c.endT() - c.startT()));
     FillStateData found;
     bool clean = true;  // outside the other operand's box: outside it

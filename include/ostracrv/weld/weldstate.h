@@ -59,6 +59,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <utility>
 #include <vector>
 
 #include "ostracrv/core/common_types.h"
@@ -329,11 +330,22 @@ class WeldStateData {
   // angle tolerance and lie on no shared stretch of the kind given, the
   // `count` with the longest chords first (their middles lie furthest from
   // the meetings that bound them); count 0 asks for the first such edge in
-  // walking order. O(edges of the subpath).
-  std::vector<Edge> SafeEdges(Edge edge, SharedWith avoid, size_t count) const;
-  // The left and right winding of the own operand beside cur, by a probe
-  // along the normal at the given fraction of its parameter range; true
-  // when the probe met nothing but plain crossings.
+  // walking order. At most kMaxSafeEdges are kept. O(edges of the subpath),
+  // allocating nothing once the scratch list has grown to the longest
+  // subpath.
+  static constexpr size_t kMaxSafeEdges = 4;
+  struct SafeEdgeList {
+    Edge edges[kMaxSafeEdges];
+    size_t size = 0;
+    bool empty() const noexcept { return size == 0; }
+  };
+  SafeEdgeList SafeEdges(Edge edge, SharedWith avoid, size_t count) const;
+  mutable std::vector<std::pair<double, Edge>> safeScratch_;  // SafeEdges' candidates
+  // The left and right winding of the own operand beside cur at the given
+  // fraction of its parameter range: by an exact ray (towards -x, or -y on
+  // a horizontal edge) where no other curve of the operand comes within the
+  // tolerance, else by a probe along the normal; true for a ray, or a probe
+  // that met nothing but plain crossings.
   bool SeedSides(Edge const& cur, double fraction, bool ownFirst, int& left, int& right) const;
   std::vector<WeldCurve> ProbeCurves(V const* points, NODETYPE const* nodes, int count, bool ownFirst) const;
   // The bits of the other operand's filled sides under an overlap entry

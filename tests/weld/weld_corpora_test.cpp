@@ -186,9 +186,7 @@ TEST(WeldCorpora, ClipperNestedHoles) {
     const PolycurveD r = PolycurveD::Union(a, PolycurveD(), false, false, WeldFlags::Precise);
     ASSERT_TRUE(AllClosedAndValid(r));
     const auto fa = Flatten(a), fr = Flatten(r);
-    MavikMath::BoundsT<double> box;
-    for (auto const& poly : fa)
-      for (V p : poly) box.Add(p);
+    const MavikMath::BoundsT<double> box = Box(fa);
     std::mt19937 rng(9);
     std::uniform_real_distribution<double> u(0.0, 1.0);
     int wrong = 0;
@@ -257,9 +255,7 @@ TEST(WeldRegressions, Files) {
     ++files;
     const bool na = rules.rfind("nonzero", 0) == 0, nb = rules.find(" nonzero") != std::string::npos;
     const auto fa = Flatten(a), fb = Flatten(b);
-    MavikMath::BoundsT<double> box;
-    for (auto const& poly : fa)
-      for (V p : poly) box.Add(p);
+    const MavikMath::BoundsT<double> box = Box(fa);
     std::mt19937 rng(4);
     std::uniform_real_distribution<double> u(0.0, 1.0);
     std::vector<V> samples;

@@ -229,11 +229,7 @@ void CheckClassification(std::mt19937& rng, int cases, double margin) {
     Case c = MakeCase(rng, iter % kKinds);
     const PolycurveT<T> a(c.a), b(c.b);  // integer: rounded operands
     const auto fa = Flatten(a), fb = Flatten(b);
-    MavikMath::BoundsT<double> box;
-    for (auto const& poly : fa)
-      for (V p : poly) box.Add(p);
-    for (auto const& poly : fb)
-      for (V p : poly) box.Add(p);
+    const MavikMath::BoundsT<double> box = Box(fa, fb);
     for (int op = 0; op < 4; ++op) {
       const PolycurveT<T> r = Apply(Op(op), a, b, c.nonZeroA, c.nonZeroB, WeldFlags::None);
       SCOPED_TRACE(c.kind + " " + kOpNames[op] + " case " + std::to_string(iter) + (c.nonZeroA ? " nz " : " eo ") +

@@ -127,6 +127,15 @@ inline double Distance(std::vector<Poly> const& polys, V p) {
   return d;
 }
 
+// The box of the flattened outlines of one or two operands.
+inline MavikMath::BoundsT<double> Box(std::vector<Poly> const& a, std::vector<Poly> const& b = {}) {
+  MavikMath::BoundsT<double> box;
+  for (auto const* polys : {&a, &b})
+    for (Poly const& poly : *polys)
+      for (V p : poly) box.Add(p);
+  return box;
+}
+
 // The area filled under the even-odd rule by loops that do not cross each
 // other (they may touch, and a loop may touch itself): by Green's theorem,
 // the sum over all segments of the integral of (x dy - y dx) / 2, each

@@ -31,9 +31,7 @@ TEST(Radians, RangesAndRoundTrips) {
 }
 
 TEST(Degrees, SignedAngleIsCounterClockwisePositive) {
-  EXPECT_NEAR(Degrees::GetFineAngle(D{1, 0}, D{0, 1}), 90.0, 1e-12);
-  EXPECT_NEAR(Degrees::GetFineAngle(D{0, 1}, D{1, 0}), -90.0, 1e-12);
-  EXPECT_NEAR(Degrees::GetFineAngle(D{1, 0}, D{-1, 0}), 180.0, 1e-12);
+  EXPECT_NEAR(Degrees::GetFineAngle(D{1, 0}, D{-1, 0}), 180.0, 1e-12);  // the end the random turns miss
   std::mt19937 rng(2);
   std::uniform_real_distribution<double> u(-179.9, 179.9), len(1e-6, 1e6);
   for (int i = 0; i < 2000; ++i) {

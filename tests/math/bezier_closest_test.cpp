@@ -91,12 +91,6 @@ TEST(BezierClosest, IntegerFormRoundsThePoint) {
     EXPECT_TRUE(ti == tv && di == dv);
     EXPECT_EQ(pi, (POINT{MavikMath::RoundToInt(pv.x), MavikMath::RoundToInt(pv.y)}));
   }
-  // Half away from zero: the lowest point (0, -2.75) of a curve from -3 to 3.
-  const POINT line[4] = {POINT{-3, -2}, POINT{-1, -3}, POINT{1, -3}, POINT{3, -2}};
-  double t = 0, d = kMaxDouble;
-  POINT p;
-  ASSERT_TRUE(FindClosestPointOnBezier(line, POINT{0, -10}, t, p, d));
-  EXPECT_EQ(p, (POINT{0, -3}));
 }
 
 // Every local minimum of the distance, checked against the sampled minima

@@ -86,13 +86,11 @@ TEST(FindBezierOffsetCurve, TightBendFarInsideTheDistance) {
   for (const Accepted& a : out) EXPECT_LT(WorstDeviationSq(a, d, 2000), tol * tol);
 }
 
-TEST(FindBezierOffsetCurve, SignConventionAndConcentricArcs) {
-  // Positive distances lie on the left of the direction of travel (y up).
-  const V line[4] = {{0, 0}, {10, 0}, {20, 0}, {30, 0}};
+// The side of positive distances (left of travel) is pinned by the random
+// test against the true offset.
+TEST(FindBezierOffsetCurve, ConcentricArcs) {
   V r[4];
   double s = -1.0;
-  ASSERT_TRUE(FindBezierOffsetCurve(line, r, 2.0, 1e-6, s));
-  for (const V& q : r) EXPECT_NEAR(q.y, 2.0, 1e-9);
   // A counter-clockwise quarter circle of radius 100 around the origin: the
   // offset of d lies on the circle of radius 100 - d, and beyond the centre
   // (d = 150) it runs backwards on radius 50.

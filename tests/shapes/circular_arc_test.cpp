@@ -75,10 +75,7 @@ void ExpectTangentArc(const V* p, const NODETYPE* nd, unsigned long n, V s, V e,
 TEST(CircularArc, ByStartEndAndTangent) {
   V p[13];
   NODETYPE nd[13];
-  ExpectTangentArc(p, nd, BuildCircularArc(p, nd, V{0, 0}, V{10, 10}, D{1, 0}), V{0, 0}, V{10, 10}, D{1, 0},
-                   V{0, 10});  // left turn
-  ExpectTangentArc(p, nd, BuildCircularArc(p, nd, V{0, 0}, V{10, -10}, D{3, 0}), V{0, 0}, V{10, -10}, D{3, 0},
-                   V{0, -10});  // right turn: built backwards and reversed
+  // Left and right turns alike: the random arcs below.
   EXPECT_EQ(BuildCircularArc(p, nd, V{0, 0}, V{10, 0}, D{1, 0}), 2u);  // along the chord: a line
   EXPECT_TRUE(nd[0] == 0x04 && nd[1] == 0x44);
   EXPECT_EQ(BuildCircularArc(p, nd, V{0, 0}, V{10, 0}, D{1, 1e-9}), 2u);  // a huge circle: the apex limit

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <initializer_list>
 #include <limits>
 #include <numbers>
 #include <random>
@@ -21,15 +22,18 @@ constexpr double kPi = std::numbers::pi;
 using testgeo::kQuarterError;
 using testgeo::MaxUnitRadialError;
 
+// Node bytes at the given positions: {index, byte}.
+void ExpectNodes(const NODETYPE* nd, std::initializer_list<std::pair<int, int>> expected) {
+  for (const auto& [i, byte] : expected) EXPECT_EQ(nd[i], byte) << "node " << i;
+}
+
 TEST(Ellipse, CircleQuadrantsAreaAndLength) {
   V p[13];
   NODETYPE nd[13];
   const double r = 250.0;
   ASSERT_EQ(OstraCrv::BuildCircle(p, nd, V{10, -20}, r), 13u);
   EXPECT_TRUE(OstraCrv::IsValidCurve(nd, 13));
-  EXPECT_EQ(nd[0], 0x2C);
-  EXPECT_EQ(nd[12], 0xA8);
-  for (int i : {3, 6, 9}) EXPECT_EQ(nd[i], 0xA4);
+  ExpectNodes(nd, {{0, 0x2C}, {3, 0xA4}, {6, 0xA4}, {9, 0xA4}, {12, 0xA8}});
   EXPECT_EQ(p[12], p[0]);
   EXPECT_NEAR(p[3].y, 230, 1e-12);  // a quarter turn counter-clockwise
   const double err = MaxUnitRadialError(p, nd, 13, V{10, -20}, r, r);
@@ -47,29 +51,22 @@ TEST(Ellipse, OffGridTurnsArcsAndPies) {
   NODETYPE nd[18];
   // Off the grid: five pieces, a smooth seam, symmetric only between whole quadrants.
   ASSERT_EQ(BuildEllipse(p, nd, V{0, 0}, 300, 100, 0.3, 0.3 + 2 * kPi, false, false), 16u);
-  EXPECT_EQ(nd[0], 0x1C);
-  EXPECT_EQ(nd[15], 0x98);
-  EXPECT_EQ(nd[3], 0x94);
-  EXPECT_EQ(nd[6], 0xA4);
-  EXPECT_EQ(nd[9], 0xA4);
-  EXPECT_EQ(nd[12], 0x94);
+  ExpectNodes(nd, {{0, 0x1C}, {3, 0x94}, {6, 0xA4}, {9, 0xA4}, {12, 0x94}, {15, 0x98}});
   EXPECT_NEAR(testgeo::ClockwiseArea(p, nd, 16), -kPi * 300 * 100, 1e-3 * kPi * 300 * 100);
   // An end angle below the start runs on counter-clockwise through angle 0.
   ASSERT_EQ(BuildEllipse(p, nd, V{0, 0}, 10, 10, 3 * kPi / 2, kPi / 2, false, false), 7u);
-  EXPECT_EQ(nd[0], 0x04);
-  EXPECT_EQ(nd[6], 0x84);
+  ExpectNodes(nd, {{0, 0x04}, {6, 0x84}});
   EXPECT_NEAR(p[3].x, 10, 1e-12);
   // A pie closes through the centre and has the sector's area.
   const double a0 = 80 * kPi / 180, a1 = 200 * kPi / 180;
   ASSERT_EQ(BuildEllipse(p, nd, V{5, 5}, 40, 40, a0, a1, true, false), 12u);
   EXPECT_TRUE(OstraCrv::IsValidCurve(nd, 12));
   EXPECT_TRUE(p[0] == (V{5, 5}) && p[11] == (V{5, 5}));
-  EXPECT_EQ(nd[10], 0x84);
-  EXPECT_EQ(nd[11], 0x48);
+  ExpectNodes(nd, {{10, 0x84}, {11, 0x48}});
   const double sector = 0.5 * 40 * 40 * (a1 - a0);
   EXPECT_NEAR(testgeo::ClockwiseArea(p, nd, 12), -sector, 1e-3 * sector);
   ASSERT_EQ(BuildEllipse(p, nd, V{5, 5}, 40, 40, a0, a1, true, true), 12u);
-  EXPECT_TRUE(nd[0] == 0x08 && nd[4] == 0x90 && nd[10] == 0x84);
+  ExpectNodes(nd, {{0, 0x08}, {4, 0x90}, {10, 0x84}});
   EXPECT_EQ(BuildEllipse(p, nd, V{0, 0}, 1, 1, 0.1, 0.1, true, false), 18u);  // the largest case
 }
 

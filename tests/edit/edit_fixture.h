@@ -54,14 +54,18 @@ Raw<T> Random(std::mt19937& rng, testpaths::Path& path, bool cusps = true, int r
 // directions, so that turned subpaths compare equal.
 using SegSet = std::multiset<std::vector<double>>;
 template <class T>
-SegSet Segments(const Raw<T>& r) {
+SegSet Segments(const T* p, const NODETYPE* b, int n) {
   SegSet out;
-  for (std::vector<double> s : testgeo::SegmentSet(r.p.data(), r.b.data(), r.n)) {
+  for (std::vector<double> s : testgeo::SegmentSet(p, b, n)) {
     std::vector<double> back;
     for (size_t k = s.size(); k >= 2; k -= 2) back.insert(back.end(), {s[k - 2], s[k - 1]});
     out.insert(std::min(s, back));
   }
   return out;
+}
+template <class T>
+SegSet Segments(const Raw<T>& r) {
+  return Segments(r.p.data(), r.b.data(), r.n);
 }
 inline std::vector<double> LineSeg(MavikMath::V a, MavikMath::V b) {
   return std::min(std::vector<double>{a.x, a.y, b.x, b.y}, std::vector<double>{b.x, b.y, a.x, a.y});

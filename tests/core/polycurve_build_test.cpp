@@ -194,10 +194,9 @@ TEST(Build, OperatorsAndReplacement) {
 TEST(Build, MakersGiveValidShapes) {
   const RECT box{-10, 20, 30, -5};
   // Both point kinds: clockwise, the same positive area.
-  EXPECT_DOUBLE_EQ(Area(Polycurve::CreateRectangle(box)), 40.0 * 25.0);
-  EXPECT_DOUBLE_EQ(Area(PolycurveD::CreateRectangle(box)), 40.0 * 25.0);
-  EXPECT_DOUBLE_EQ(PolycurveD::CreateRectangle(box).GetArea(), Polycurve::CreateRectangle(box).GetArea());
-  EXPECT_GT(PolycurveD::CreateRectangle(box).GetArea(), 0.0);
+  for (double a : {Area(Polycurve::CreateRectangle(box)), Area(PolycurveD::CreateRectangle(box)),
+                   Polycurve::CreateRectangle(box).GetArea(), PolycurveD::CreateRectangle(box).GetArea()})
+    EXPECT_DOUBLE_EQ(a, 40.0 * 25.0);
   PolycurveD c = PolycurveD::CreateCircle(V{0, 0}, 10);
   c.CreateEllipseSubpath(V{100, 0}, V{20, 5});
   c.Create3PointArcSubpath(V{0, 0}, V{10, 0}, V{5, 5});

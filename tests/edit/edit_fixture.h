@@ -22,6 +22,13 @@ struct Raw {
   int n = 0;
   bool Valid() const { return OstraCrv::IsValidCurve(b.data(), unsigned(n)); }
   int Subpaths() const { return CRV_NumSubpaths(b.data(), n); }
+  // Takes the live count an edit returned: true if the edit succeeded and
+  // left a valid path.
+  bool Take(int count) {
+    if (count <= 0) return false;
+    n = count;
+    return Valid();
+  }
   // Live entries only, so that untouched arrays compare equal.
   bool operator==(const Raw& o) const {
     return n == o.n && std::equal(p.begin(), p.begin() + n, o.p.begin()) &&

@@ -43,9 +43,7 @@ void BreakInsideSegments(double tol) {
     const int subpaths = r.Subpaths();
     const int sp = path.subpathOf(seg.end);
     const int n = CRV_BreakAtLocation(r.p.data(), r.b.data(), r.n, seg.end, t);
-    ASSERT_GT(n, 0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     // A closed subpath opens into one; an open one parts in two. Stray moves
     // of the path are tidied away.
     const bool text = IsLetterNode(path.nodes[0]);
@@ -79,9 +77,7 @@ TEST(BreakAtLocation, AtNodesKeepsSegmentsAndPartsThePathThere) {
       EXPECT_TRUE(r == before) << k;
       continue;
     }
-    ASSERT_GT(n, 0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(testedit::Segments(r), testedit::Segments(before)) << k;
     // Some subpath now ends at the break point and another (or the same one)
     // starts there.
@@ -164,7 +160,7 @@ TEST(OpenAllSubpaths, LeavesOnlyOpenSubpathsWithTheSameSegments) {
     EXPECT_EQ(testgeo::SegmentSet(c.GetPoints(), b, n), testgeo::SegmentSet(r.p.data(), r.b.data(), r.n)) << k;
     // Only a lone closed move (no segment to open) keeps its closed bit.
     for (int i = 0; i < n; ++i)
-      if (IsClosedNode(b[i])) EXPECT_TRUE(IsMove(b[i]) && CRV_IsLastSubpathNode(b, n, i)) << k;
+      EXPECT_TRUE(!IsClosedNode(b[i]) || (IsMove(b[i]) && CRV_IsLastSubpathNode(b, n, i))) << k;
   }
 }
 

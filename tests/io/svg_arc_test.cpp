@@ -233,7 +233,7 @@ TEST(SvgArc, RotationIsTakenModuloAFullTurn) {
   PolycurveD a, b;
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A8 3 30 1 0 5 7", a));
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A8 3 390 1 0 5 7", b));
-  ExpectClose(std::vector<V>(a.Points().begin(), a.Points().end()), std::vector<V>(b.Points().begin(), b.Points().end()));
+  ExpectClose({a.GetPoints(), a.GetPoints() + a.GetPointCount()}, {b.GetPoints(), b.GetPoints() + b.GetPointCount()});
 }
 
 }  // namespace

@@ -282,18 +282,13 @@ TYPED_TEST(PolycurveTyped, BadInputGivesFailureValues) {
 
   // Reads out of range answer the static defaults.
   const T zero{};
-  EXPECT_TRUE(BytesEqual(&a.GetPoint(-1), &zero, 1));
-  EXPECT_TRUE(BytesEqual(&a.GetPoint(3), &zero, 1));
-  EXPECT_EQ(a.GetNodeType(-1), 0x04);
-  EXPECT_EQ(a.GetNodeType(INT_MAX), 0x04);
+  for (int i : {-1, 3, INT_MAX}) EXPECT_TRUE(BytesEqual(&a.GetPoint(i), &zero, 1) && a.GetNodeType(i) == 0x04) << i;
   EXPECT_EQ(a.GetSegmentType(3), SegmentType::move);
   EXPECT_FALSE(a.IsLetter(3));
   EXPECT_FALSE(a.IsUser(-1));
   EXPECT_EQ(a.GetContinuity(99), ContinuityType::cusp);
-  const PolycurveT<T> empty;
-  EXPECT_TRUE(BytesEqual(&empty.GetFirstPoint(), &zero, 1));
-  EXPECT_TRUE(BytesEqual(&empty.GetLastPoint(), &zero, 1));
   PolycurveT<T> e2;
+  EXPECT_TRUE(BytesEqual(&e2.GetFirstPoint(), &zero, 1) && BytesEqual(&e2.GetLastPoint(), &zero, 1));
   EXPECT_FALSE(e2.SetFirstPoint(Pt<T>(1, 1)));
   EXPECT_FALSE(e2.SetLastPoint(Pt<T>(1, 1)));
   EXPECT_TRUE(e2.Points().empty());

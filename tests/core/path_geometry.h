@@ -129,6 +129,20 @@ std::multiset<std::vector<double>> SegmentSet(const T* p, const NODETYPE* n, int
   return out;
 }
 
+// The same measures of a whole curve.
+template <class C>
+double CurveArea(const C& c) {
+  return ClockwiseArea(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
+}
+template <class C>
+double CurveLength(const C& c) {
+  return Length(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
+}
+template <class C>
+std::multiset<std::vector<double>> CurveSegments(const C& c) {
+  return SegmentSet(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
+}
+
 // The point at t on the segment that starts at node s.
 template <class T>
 V PointAt(const T* p, const NODETYPE* n, int s, double t) {

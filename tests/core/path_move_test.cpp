@@ -37,27 +37,23 @@ TYPED_TEST(PathMove, GapsAndMovesMatchVectorEdits) {
     for (int k = 0; k < cap; ++k) pts[k] = pointOf<T>(k), nodes[k] = NODETYPE(k), ref[k] = k;
     const int i = int(rng() % unsigned(n));
     const int op = int(rng() % 3);
+    // Entries past the new end keep their values.
+    std::vector<int> expected(ref);
     if (op == 0) {
       const int count = 1 + int(rng() % unsigned(n - i));
       PathDelNext(nodes.data(), pts.data(), i, count, n);
-      // The tail slides down; the entries past the new end keep their values.
-      std::vector<int> expected(ref);
       std::copy(ref.begin() + i + count, ref.begin() + n, expected.begin() + i);
-      ref = expected;
     } else if (op == 1) {
       const int count = 1 + int(rng() % 8);
       PathInsNext(nodes.data(), pts.data(), i, count, n);
-      std::vector<int> expected(ref);
       std::copy(ref.begin() + i, ref.begin() + n, expected.begin() + i + count);
-      ref = expected;
     } else {
       const int count = 1 + int(rng() % unsigned(n));
       const int from = int(rng() % unsigned(cap - count + 1)), to = int(rng() % unsigned(cap - count + 1));
       OstraCrv::MovePath(pts.data(), nodes.data(), to, from, count);
-      std::vector<int> expected(ref);
       std::copy(ref.begin() + from, ref.begin() + from + count, expected.begin() + to);
-      ref = expected;
     }
+    ref = expected;
     for (int k = 0; k < cap; ++k) {
       ASSERT_EQ(pts[k], pointOf<T>(ref[k]));
       ASSERT_EQ(nodes[k], NODETYPE(ref[k]));

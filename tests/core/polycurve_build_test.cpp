@@ -27,10 +27,7 @@ using Bytes = std::vector<NODETYPE>;
 using testgeo::NodesOf;
 using testgeo::Polyline;
 using testgeo::Valid;
-template <class C>
-double Area(const C& c) {
-  return testgeo::ClockwiseArea(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
-}
+using testgeo::CurveArea;
 
 TEST(Build, AppendsAndCollinearMerge) {
   PolycurveD c;
@@ -144,7 +141,7 @@ TEST(Build, DeleteSegmentOnRandomPathsRemovesExactlyThatSegment) {
     expected.erase(expected.find(*gone.begin()));
     ASSERT_TRUE(c.DeleteSegment(seg.end)) << k;
     ASSERT_TRUE(Valid(c)) << k;
-    EXPECT_EQ(testgeo::SegmentSet(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount())), expected) << k;
+    EXPECT_EQ(testgeo::CurveSegments(c), expected) << k;
   }
 }
 
@@ -194,16 +191,15 @@ TEST(Build, OperatorsAndReplacement) {
 TEST(Build, MakersGiveValidShapes) {
   const RECT box{-10, 20, 30, -5};
   // Both point kinds: clockwise, the same positive area.
-  EXPECT_DOUBLE_EQ(Area(Polycurve::CreateRectangle(box)), 40.0 * 25.0);
-  EXPECT_DOUBLE_EQ(Area(PolycurveD::CreateRectangle(box)), 40.0 * 25.0);
-  EXPECT_DOUBLE_EQ(PolycurveD::CreateRectangle(box).GetArea(), Polycurve::CreateRectangle(box).GetArea());
-  EXPECT_GT(PolycurveD::CreateRectangle(box).GetArea(), 0.0);
+  for (double a : {CurveArea(Polycurve::CreateRectangle(box)), CurveArea(PolycurveD::CreateRectangle(box)),
+                   Polycurve::CreateRectangle(box).GetArea(), PolycurveD::CreateRectangle(box).GetArea()})
+    EXPECT_DOUBLE_EQ(a, 40.0 * 25.0);
   PolycurveD c = PolycurveD::CreateCircle(V{0, 0}, 10);
   c.CreateEllipseSubpath(V{100, 0}, V{20, 5});
   c.Create3PointArcSubpath(V{0, 0}, V{10, 0}, V{5, 5});
   c.CreateLineSubpath(V{0, 0}, V{1, 1});
   EXPECT_TRUE(Valid(c) && c.GetNumberOfSubpaths() == 4 && c.GetPointCount() == 35u);
-  EXPECT_NEAR(Area(c.GetSubpath(13)), -std::numbers::pi * 100, 0.3);
+  EXPECT_NEAR(CurveArea(c.GetSubpath(13)), -std::numbers::pi * 100, 0.3);
   EXPECT_FALSE(c.CreateCircleSubpath(V{0, 0}, std::nan("")));  // nothing written, nothing changed
   EXPECT_EQ(c.GetPointCount(), 35u);
   EXPECT_EQ(Polycurve::CreateEllipse(POINT{0, 0}, POINT{100, 50}).GetPoint(3), (POINT{0, 50}));

@@ -21,10 +21,8 @@ using Bytes = std::vector<NODETYPE>;
 
 using testgeo::NodesOf;
 using testgeo::RandomCurve;
+using testgeo::CurveSegments;
 using testgeo::Valid;
-std::multiset<std::vector<double>> Segments(const PolycurveD& c) {
-  return testgeo::SegmentSet(c.GetPoints(), c.GetNodeTypes(), int(c.GetPointCount()));
-}
 PolycurveD ClosedSquare() {
   PolycurveD sq;
   for (const V& p : {V{0, 0}, V{10, 0}, V{10, 10}, V{0, 10}, V{0, 0}}) sq.IsEmpty() ? sq.MoveTo(p) : sq.LineTo(p);
@@ -41,10 +39,9 @@ TEST(Reverse, TwiceRestoresAndFlipsTheArea) {
     PolycurveD r = original;
     r.Reverse();
     ASSERT_TRUE(Valid(r)) << k;
-    const double area = testgeo::ClockwiseArea(original.GetPoints(), original.GetNodeTypes(), path.n());
-    EXPECT_NEAR(testgeo::ClockwiseArea(r.GetPoints(), r.GetNodeTypes(), path.n()), -area, 1e-6 * (1 + std::fabs(area)));
-    const double len = testgeo::Length(original.GetPoints(), original.GetNodeTypes(), path.n());
-    EXPECT_NEAR(testgeo::Length(r.GetPoints(), r.GetNodeTypes(), path.n()), len, 1e-9 * len);
+    const double area = testgeo::CurveArea(original), len = testgeo::CurveLength(original);
+    EXPECT_NEAR(testgeo::CurveArea(r), -area, 1e-6 * (1 + std::fabs(area)));
+    EXPECT_NEAR(testgeo::CurveLength(r), len, 1e-9 * len);
     r.Reverse();
     ASSERT_EQ(r, original) << k;
   }
@@ -80,7 +77,7 @@ TEST(Spin, KeepsTheShapeAndTurnsBack) {
     EXPECT_EQ(c.GetPoint(sp.first), before.GetPoint(node));
     EXPECT_EQ(c.GetPoint(sp.last), c.GetPoint(sp.first));
     EXPECT_EQ(CRV_GetUserNode(c.GetNodeTypes(), int(c.GetPointCount()), sp.last), sp.first);
-    EXPECT_EQ(Segments(c), Segments(before)) << k;  // the same segments, the ring starting elsewhere
+    EXPECT_EQ(CurveSegments(c), CurveSegments(before)) << k;  // the same segments, the ring starting elsewhere
     // Turning on to the old start restores every point.
     ASSERT_TRUE(c.SpinSubpath(static_cast<unsigned long>(sp.first), static_cast<unsigned long>(sp.last - node + sp.first)));
     EXPECT_TRUE(std::equal(c.GetPoints(), c.GetPoints() + path.n(), before.GetPoints())) << k;
@@ -95,7 +92,7 @@ TEST(Spin, KeepsTheShapeAndTurnsBack) {
   // SetPathStartAt turns a one-subpath curve the same way.
   PolycurveD sq = ClosedSquare();
   ASSERT_TRUE(sq.SetPathStartAt(2));
-  EXPECT_TRUE(Valid(sq) && sq.GetFirstPoint() == (V{10, 10}) && Segments(sq) == Segments(ClosedSquare()));
+  EXPECT_TRUE(Valid(sq) && sq.GetFirstPoint() == (V{10, 10}) && CurveSegments(sq) == CurveSegments(ClosedSquare()));
   EXPECT_FALSE(sq.SetPathStartAt(4));
 }
 

@@ -11,6 +11,7 @@
 #include <stdexcept>
 #include <vector>
 
+#include "core/path_geometry.h"
 #include "polycurve.h"
 
 namespace {
@@ -20,6 +21,8 @@ using MavikMath::V;
 using OstraCrv::PolycurveRefT;
 using OstraCrv::PolycurveT;
 using OstraCrv::PolylineT;
+using Bytes = std::vector<NODETYPE>;
+using testgeo::NodesOf;
 
 template <class T>
 T Pt(double x, double y) {
@@ -134,10 +137,7 @@ TYPED_TEST(PolycurveTyped, ReferenceBorrowsUntilOwnershipIsTaken) {
   // Reads see the caller's memory directly and answer as an owning copy.
   EXPECT_EQ(r.GetPoints(), caller.pts.data());
   EXPECT_EQ(r.Compare(Make(caller)), 0);
-
-  // (That writes through a view never reach the caller is checked by the
-  // random run.)
-
+  // (That writes through a view never reach the caller: the random run.)
   // Taking ownership copies borrowed arrays: later changes by the caller are
   // not seen.
   PolycurveRefT<T> view(caller.pts.data(), caller.nodes.data(), caller.pts.size());
@@ -147,27 +147,19 @@ TYPED_TEST(PolycurveTyped, ReferenceBorrowsUntilOwnershipIsTaken) {
   caller.pts[1] = Pt<T>(1000, 1000);
   EXPECT_TRUE(Matches(keep, snapshot));
 
-  // On owning storage ownership is already there, and sharing stays.
-  PolycurveT<T> a = Make(snapshot), b(a);
+  // On owning storage ownership is already there, and sharing stays; so
+  // does appending to an empty curve, except from a borrowed view, which is
+  // copied.
+  PolycurveT<T> a = Make(snapshot), b(a), e1, e2;
   b.EnsureDataOwnership();
   EXPECT_TRUE(a.IsSameData(b));
-}
-
-TYPED_TEST(PolycurveTyped, AppendingToAnEmptyCurveShares) {
-  using T = TypeParam;
-  const Model<T> m = Line<T>(3);
-  const PolycurveT<T> src = Make(m);
-  PolycurveT<T> empty;
-  empty.PushBack(src);
-  EXPECT_TRUE(empty.IsSameData(src));
-
-  // ... except from a borrowed view, which is copied.
-  PolycurveRefT<T> view(m.pts.data(), m.nodes.data(), m.pts.size());
-  PolycurveT<T> e2;
-  e2.PushBack(view);
-  EXPECT_FALSE(e2.IsSameData(view));
-  EXPECT_NE(e2.GetPoints(), m.pts.data());
-  EXPECT_TRUE(Matches(e2, m));
+  e1.PushBack(a);
+  EXPECT_TRUE(e1.IsSameData(a));
+  PolycurveRefT<T> v2(snapshot.pts.data(), snapshot.nodes.data(), snapshot.pts.size());
+  e2.PushBack(v2);
+  EXPECT_FALSE(e2.IsSameData(v2));
+  EXPECT_NE(e2.GetPoints(), snapshot.pts.data());
+  EXPECT_TRUE(Matches(e2, snapshot));
 }
 
 TYPED_TEST(PolycurveTyped, ImpossibleRequestsThrowAndLeaveTheCurve) {
@@ -195,12 +187,6 @@ TYPED_TEST(PolycurveTyped, OperatorsFollowCompare) {
   EXPECT_TRUE(x == y);
   y.SetNodeType(2, NodeTypes::Open::curve);
   EXPECT_FALSE(x == y);
-
-  // Sorting a mixed set puts them in order of count.
-  std::vector<PolycurveT<T>> all;
-  for (int n : {5, 1, 3, 0, 2, 4, 3}) all.push_back(Make(Line<T>(n, n * 3)));
-  std::sort(all.begin(), all.end());
-  for (size_t i = 1; i < all.size(); ++i) EXPECT_LE(all[i - 1].GetPointCount(), all[i].GetPointCount());
 }
 
 TEST(PolycurveCompare, DoubleCoordinatesCompareAsBits) {
@@ -220,24 +206,13 @@ TEST(PolycurveCompare, DoubleCoordinatesCompareAsBits) {
 TYPED_TEST(PolycurveTyped, PolylineNodes) {
   using T = TypeParam;
   const T tri[] = {Pt<T>(0, 0), Pt<T>(10, 0), Pt<T>(10, 10)};
-  const PolylineT<T> open(tri, 3, false);
-  EXPECT_EQ(std::vector<NODETYPE>(open.NodeTypes().begin(), open.NodeTypes().end()),
-            (std::vector<NODETYPE>{0x04, 0x44, 0x44}));
-
+  EXPECT_EQ(NodesOf(PolylineT<T>(tri, 3, false)), (Bytes{0x04, 0x44, 0x44}));
   const PolylineT<T> closed(tri, 3, true);
-  ASSERT_EQ(closed.GetPointCount(), 4u);
-  EXPECT_EQ(std::vector<NODETYPE>(closed.NodeTypes().begin(), closed.NodeTypes().end()),
-            (std::vector<NODETYPE>{0x0C, 0x44, 0x44, 0x48}));
+  EXPECT_EQ(NodesOf(closed), (Bytes{0x0C, 0x44, 0x44, 0x48}));
   EXPECT_TRUE(BytesEqual(&closed.GetLastPoint(), &tri[0], 1));
-
-  const T ring[] = {Pt<T>(0, 0), Pt<T>(10, 0), Pt<T>(0, 0)};
-  const PolylineT<T> shut(ring, 3, true);
-  EXPECT_EQ(std::vector<NODETYPE>(shut.NodeTypes().begin(), shut.NodeTypes().end()),
-            (std::vector<NODETYPE>{0x0C, 0x44, 0x48}));
-
-  const PolylineT<T> one(tri, 1, true);
-  ASSERT_EQ(one.GetPointCount(), 1u);
-  EXPECT_EQ(one.GetNodeType(0), 0x04);
+  const T ring[] = {Pt<T>(0, 0), Pt<T>(10, 0), Pt<T>(0, 0)};  // already ends on its start
+  EXPECT_EQ(NodesOf(PolylineT<T>(ring, 3, true)), (Bytes{0x0C, 0x44, 0x48}));
+  EXPECT_EQ(NodesOf(PolylineT<T>(tri, 1, true)), (Bytes{0x04}));
   EXPECT_TRUE(PolylineT<T>(tri, 0, true).IsEmpty());
   EXPECT_TRUE(PolylineT<T>(nullptr, 5, true).IsEmpty());
 }
@@ -307,18 +282,13 @@ TYPED_TEST(PolycurveTyped, BadInputGivesFailureValues) {
 
   // Reads out of range answer the static defaults.
   const T zero{};
-  EXPECT_TRUE(BytesEqual(&a.GetPoint(-1), &zero, 1));
-  EXPECT_TRUE(BytesEqual(&a.GetPoint(3), &zero, 1));
-  EXPECT_EQ(a.GetNodeType(-1), 0x04);
-  EXPECT_EQ(a.GetNodeType(INT_MAX), 0x04);
+  for (int i : {-1, 3, INT_MAX}) EXPECT_TRUE(BytesEqual(&a.GetPoint(i), &zero, 1) && a.GetNodeType(i) == 0x04) << i;
   EXPECT_EQ(a.GetSegmentType(3), SegmentType::move);
   EXPECT_FALSE(a.IsLetter(3));
   EXPECT_FALSE(a.IsUser(-1));
   EXPECT_EQ(a.GetContinuity(99), ContinuityType::cusp);
-  const PolycurveT<T> empty;
-  EXPECT_TRUE(BytesEqual(&empty.GetFirstPoint(), &zero, 1));
-  EXPECT_TRUE(BytesEqual(&empty.GetLastPoint(), &zero, 1));
   PolycurveT<T> e2;
+  EXPECT_TRUE(BytesEqual(&e2.GetFirstPoint(), &zero, 1) && BytesEqual(&e2.GetLastPoint(), &zero, 1));
   EXPECT_FALSE(e2.SetFirstPoint(Pt<T>(1, 1)));
   EXPECT_FALSE(e2.SetLastPoint(Pt<T>(1, 1)));
   EXPECT_TRUE(e2.Points().empty());
@@ -465,6 +435,14 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
     const int a = pick(0, kSlots - 1), b = pick(0, kSlots - 1);
     PolycurveT<T>& c = h[a];
     Model<T>& mm = m[a];
+    // Model edits: keep the first k nodes (when fewer), append nodes of another model.
+    auto cut = [&mm](int k) {
+      if (k >= 0 && k < int(mm.pts.size())) mm.pts.resize(k), mm.nodes.resize(k);
+    };
+    auto add = [&mm](const Model<T>& r, int from, int k) {
+      mm.pts.insert(mm.pts.end(), r.pts.begin() + from, r.pts.begin() + from + k);
+      mm.nodes.insert(mm.nodes.end(), r.nodes.begin() + from, r.nodes.begin() + from + k);
+    };
     const int n = int(mm.pts.size());
     const int op = pick(0, 25);
     switch (op) {
@@ -475,10 +453,7 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
       case 1: {
         const int k = pick(-1, n + 1);
         c.ReleaseBuffer(k);
-        if (k >= 0 && k < n) {
-          mm.pts.resize(k);
-          mm.nodes.resize(k);
-        }
+        cut(k);
         break;
       }
       case 2: {
@@ -499,22 +474,19 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
         const T p = RandomPoint<T>(rng);
         const NODETYPE v = NODETYPE(rng());
         c.PushBack(p, v);
-        mm.pts.push_back(p);
-        mm.nodes.push_back(v);
+        add(Model<T>{{p}, {v}}, 0, 1);
         break;
       }
       case 5: {
         const Model<T> r = RandomArrays<T>(rng, 5);
         EXPECT_TRUE(c.PushBack(r.pts.data(), r.nodes.data(), r.pts.size()));
-        mm.pts.insert(mm.pts.end(), r.pts.begin(), r.pts.end());
-        mm.nodes.insert(mm.nodes.end(), r.nodes.begin(), r.nodes.end());
+        add(r, 0, int(r.pts.size()));
         break;
       }
       case 6: {
-        const Model<T> add = m[b];  // b may be a itself
+        const Model<T> other = m[b];  // b may be a itself
         c.PushBack(h[b]);
-        mm.pts.insert(mm.pts.end(), add.pts.begin(), add.pts.end());
-        mm.nodes.insert(mm.nodes.end(), add.nodes.begin(), add.nodes.end());
+        add(other, 0, int(other.pts.size()));
         break;
       }
       case 7: {
@@ -530,10 +502,7 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
       case 9: {
         const int k = pick(0, n + 2);
         c.Truncate(unsigned(k));
-        if (k < n) {
-          mm.pts.resize(k);
-          mm.nodes.resize(k);
-        }
+        cut(k);
         break;
       }
       case 10:
@@ -556,10 +525,7 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
         }
         const int keep = pick(-1, buf.count + 2);
         EXPECT_EQ(c.ReleaseBufferInternal(keep), keep >= 0);
-        if (keep >= 0 && keep < buf.count) {
-          mm.pts.resize(keep);
-          mm.nodes.resize(keep);
-        }
+        cut(keep);
         break;
       }
       case 12: {
@@ -660,17 +626,16 @@ TYPED_TEST(PolycurveTyped, RandomEditsMatchTheReferenceModel) {
         // Append a stretch of the curve's own arrays (they may move meanwhile).
         const int from = pick(0, n), k = pick(0, n - from);
         EXPECT_TRUE(c.PushBack(c.GetPoints() + from, c.GetNodeTypes() + from, unsigned(k)));
-        const Model<T> old = mm;
-        mm.pts.insert(mm.pts.end(), old.pts.begin() + from, old.pts.begin() + from + k);
-        mm.nodes.insert(mm.nodes.end(), old.nodes.begin() + from, old.nodes.begin() + from + k);
+        add(Model<T>(mm), from, k);
         break;
       }
       case 25: {
         // Replace the content by an overlapping stretch of itself.
         const int from = pick(0, n), k = pick(0, n - from);
         EXPECT_TRUE(c.SetPoints(c.GetPoints() + from, c.GetNodeTypes() + from, unsigned(k)));
-        mm.pts = std::vector<T>(mm.pts.begin() + from, mm.pts.begin() + from + k);
-        mm.nodes = std::vector<NODETYPE>(mm.nodes.begin() + from, mm.nodes.begin() + from + k);
+        const Model<T> old = mm;
+        mm = Model<T>();
+        add(old, from, k);
         break;
       }
     }

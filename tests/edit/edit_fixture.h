@@ -22,6 +22,13 @@ struct Raw {
   int n = 0;
   bool Valid() const { return OstraCrv::IsValidCurve(b.data(), unsigned(n)); }
   int Subpaths() const { return CRV_NumSubpaths(b.data(), n); }
+  // Takes the live count an edit returned: true if the edit succeeded and
+  // left a valid path.
+  bool Take(int count) {
+    if (count <= 0) return false;
+    n = count;
+    return Valid();
+  }
   // Live entries only, so that untouched arrays compare equal.
   bool operator==(const Raw& o) const {
     return n == o.n && std::equal(p.begin(), p.begin() + n, o.p.begin()) &&
@@ -54,14 +61,18 @@ Raw<T> Random(std::mt19937& rng, testpaths::Path& path, bool cusps = true, int r
 // directions, so that turned subpaths compare equal.
 using SegSet = std::multiset<std::vector<double>>;
 template <class T>
-SegSet Segments(const Raw<T>& r) {
+SegSet Segments(const T* p, const NODETYPE* b, int n) {
   SegSet out;
-  for (std::vector<double> s : testgeo::SegmentSet(r.p.data(), r.b.data(), r.n)) {
+  for (std::vector<double> s : testgeo::SegmentSet(p, b, n)) {
     std::vector<double> back;
     for (size_t k = s.size(); k >= 2; k -= 2) back.insert(back.end(), {s[k - 2], s[k - 1]});
     out.insert(std::min(s, back));
   }
   return out;
+}
+template <class T>
+SegSet Segments(const Raw<T>& r) {
+  return Segments(r.p.data(), r.b.data(), r.n);
 }
 inline std::vector<double> LineSeg(MavikMath::V a, MavikMath::V b) {
   return std::min(std::vector<double>{a.x, a.y, b.x, b.y}, std::vector<double>{b.x, b.y, a.x, a.y});

@@ -14,20 +14,16 @@ using testedit::Raw;
 // The segment that ends at node e, as the library's point tuple, split at t.
 template <class T>
 testedit::SegSet Halves(const Raw<T>& r, int e, double t) {
-  Raw<T> h;
   if (IsLine(r.b[e])) {
-    const V a = MavikMath::ToV(r.p[e - 1]), b = MavikMath::ToV(r.p[e]);
-    const T m = MavikMath::FromV<T>(MavikMath::Lerp(a, b, t));
-    h.p = {r.p[e - 1], m, m, r.p[e]};
-    h.b = {0x04, 0x44, 0x04, 0x44};
-  } else {
-    T left[4], right[4];
-    MavikMath::CubicBezier::Split(t, &r.p[e - 3], left, right);
-    h.p = {left[0], left[1], left[2], left[3], right[0], right[1], right[2], right[3]};
-    h.b = {0x04, 0xC0, 0xC0, 0x84, 0x04, 0xC0, 0xC0, 0x84};
+    const T m = MavikMath::FromV<T>(MavikMath::Lerp(MavikMath::ToV(r.p[e - 1]), MavikMath::ToV(r.p[e]), t));
+    const T h[] = {r.p[e - 1], m, m, r.p[e]};
+    const NODETYPE b[] = {0x04, 0x44, 0x04, 0x44};
+    return testedit::Segments(h, b, 4);
   }
-  h.n = int(h.p.size());
-  return testedit::Segments(h);
+  T h[8];
+  MavikMath::CubicBezier::Split(t, &r.p[e - 3], h, h + 4);
+  const NODETYPE b[] = {0x04, 0xC0, 0xC0, 0x84, 0x04, 0xC0, 0xC0, 0x84};
+  return testedit::Segments(h, b, 8);
 }
 
 template <class T>
@@ -40,22 +36,14 @@ void BreakInsideSegments(double tol) {
     const testpaths::Segment seg = path.segments[rng() % path.segments.size()];
     const double t = std::uniform_real_distribution<double>(0.01, 0.99)(rng);
     testedit::SegSet expected = testedit::Segments(r);
-    {
-      // Remove the cut segment from the expectation and add its halves.
-      Raw<T> one;
-      one.p.assign(r.p.begin() + seg.start, r.p.begin() + seg.end + 1);
-      one.b.assign(r.b.begin() + seg.start, r.b.begin() + seg.end + 1);
-      one.b[0] = 0x04;
-      one.n = int(one.p.size());
-      expected.erase(expected.find(*testedit::Segments(one).begin()));
-      for (const auto& s : Halves(r, seg.end, t)) expected.insert(s);
-    }
+    // The cut segment is replaced by its halves.
+    expected.erase(expected.find(
+        *testedit::Segments(r.p.data() + seg.start, r.b.data() + seg.start, seg.end - seg.start + 1).begin()));
+    for (const auto& s : Halves(r, seg.end, t)) expected.insert(s);
     const int subpaths = r.Subpaths();
     const int sp = path.subpathOf(seg.end);
     const int n = CRV_BreakAtLocation(r.p.data(), r.b.data(), r.n, seg.end, t);
-    ASSERT_GT(n, 0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     // A closed subpath opens into one; an open one parts in two. Stray moves
     // of the path are tidied away.
     const bool text = IsLetterNode(path.nodes[0]);
@@ -89,9 +77,7 @@ TEST(BreakAtLocation, AtNodesKeepsSegmentsAndPartsThePathThere) {
       EXPECT_TRUE(r == before) << k;
       continue;
     }
-    ASSERT_GT(n, 0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(testedit::Segments(r), testedit::Segments(before)) << k;
     // Some subpath now ends at the break point and another (or the same one)
     // starts there.
@@ -167,19 +153,14 @@ TEST(OpenAllSubpaths, LeavesOnlyOpenSubpathsWithTheSameSegments) {
     OstraCrv::Polycurve c(r.p.data(), r.b.data(), unsigned(r.n));
     const OstraCrv::Polycurve shared = c;
     c.OpenAllSubpaths();
-    ASSERT_TRUE(OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount())) << k;
+    ASSERT_TRUE(testgeo::Valid(c)) << k;
     EXPECT_TRUE(shared.GetPointCount() == unsigned(r.n));  // the copy did not change
-    Raw<POINT> out{{c.GetPoints(), c.GetPoints() + c.GetPointCount()},
-                   {c.GetNodeTypes(), c.GetNodeTypes() + c.GetPointCount()},
-                   int(c.GetPointCount())};
-    EXPECT_EQ(testgeo::SegmentSet(out.p.data(), out.b.data(), out.n), testgeo::SegmentSet(r.p.data(), r.b.data(), r.n))
-        << k;
-    for (int i = 0; i < out.n; ++i) {
-      // Only a lone closed move (no segment to open) keeps its closed bit.
-      if (IsClosedNode(out.b[i])) {
-        EXPECT_TRUE(IsMove(out.b[i]) && CRV_IsLastSubpathNode(out.b.data(), out.n, i)) << k;
-      }
-    }
+    const NODETYPE* b = c.GetNodeTypes();
+    const int n = int(c.GetPointCount());
+    EXPECT_EQ(testgeo::SegmentSet(c.GetPoints(), b, n), testgeo::SegmentSet(r.p.data(), r.b.data(), r.n)) << k;
+    // Only a lone closed move (no segment to open) keeps its closed bit.
+    for (int i = 0; i < n; ++i)
+      EXPECT_TRUE(!IsClosedNode(b[i]) || (IsMove(b[i]) && CRV_IsLastSubpathNode(b, n, i))) << k;
   }
 }
 

@@ -38,8 +38,7 @@ TEST(JoinTwoNodes, TwoSubpathsBecomeOneWithTheSameSegments) {
     int joined = -1;
     const int n = CRV_JoinTwoNodesExt(r.p.data(), r.b.data(), r.n, a, b, &joined);
     ASSERT_EQ(n, before.n - 1) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(r.Subpaths(), before.Subpaths() - 1) << k;
     EXPECT_EQ(testedit::Segments(r), testedit::Segments(before)) << k;
     ASSERT_TRUE(joined >= 0 && joined < n) << k;
@@ -68,8 +67,7 @@ TEST(JoinTwoNodes, EndsOfOneSubpathCloseIt) {
     int joined = -1;
     const int n = CRV_JoinTwoNodesExt(r.p.data(), r.b.data(), r.n, a, b, &joined);
     ASSERT_EQ(n, before.n - Stray(path)) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     // The subpath is closed at the midpoint with one user end.
     const int f = joined, l = CRV_LastNodeOfThisSubpath(r.b.data(), n, f);
     EXPECT_EQ(r.p[f], mid);
@@ -91,8 +89,7 @@ TEST(JoinTwoNodes, WithLinesAddsOnlyTheBridge) {
     const int n0 = r.n;
     const int n = crvJoinTwoNodes(r.p.data(), r.b.data(), r.n, a, b, true);
     ASSERT_EQ(n, same ? n0 + 1 - Stray(path) : n0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(testedit::Segments(r), expected) << k;
   }
 }
@@ -122,8 +119,7 @@ TEST(JoinTwoNodesWithOpenSubpath, InsertsTheSubpathBetweenTwoEnds) {
     int A = a, B = b, C = c, D = d;
     const int n = CRV_JoinTwoNodesWithOpenSubpathExt(r.p.data(), r.b.data(), r.n, &A, &B, &C, &D);
     ASSERT_EQ(n, same ? before.n - 1 - Stray(path) : before.n - 2) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(r.Subpaths(), before.Subpaths() - (same ? 1 + Stray(path) : 2)) << k;
     EXPECT_EQ(testedit::Segments(r), testedit::Segments(before)) << k;
     // The rewritten indices name the joined nodes.
@@ -162,9 +158,7 @@ TEST(JoinEnabled, ClosesEachSubpathWithBothEndsSelected) {
     const testedit::SegSet before = testedit::Segments(r);
     const int closedBefore = CRV_NumSubpaths(r.b.data(), r.n) - CRV_HowManyOpenSubpaths(r.b.data(), r.n);
     const int n = CRV_JoinEnabledAddingLineSegments(r.p.data(), r.b.data(), r.n);
-    ASSERT_GT(n, 0) << k;
-    r.n = n;
-    ASSERT_TRUE(r.Valid()) << k;
+    ASSERT_TRUE(r.Take(n)) << k;
     EXPECT_EQ(CRV_NumSubpaths(r.b.data(), n) - CRV_HowManyOpenSubpaths(r.b.data(), n), closedBefore + toClose) << k;
     EXPECT_EQ(testedit::Segments(r).size(), before.size() + bridges) << k;
   }

@@ -77,10 +77,8 @@ TEST(Selection, EditsKeepTwinsInStepAndRefuseBadInput) {
         default: CRV_EnableOneControl(b.data(), n, i); break;
       }
       ASSERT_TRUE(Valid(b)) << k;
-      for (const auto& sp : path.subpaths) {
-        if (!sp.closed) continue;
-        ASSERT_EQ(IsEnabledNode(b[sp.first]), IsEnabledNode(b[sp.last])) << k;
-      }
+      for (const auto& sp : path.subpaths)
+        ASSERT_TRUE(!sp.closed || IsEnabledNode(b[sp.first]) == IsEnabledNode(b[sp.last])) << k;
     }
     const Bytes before = b;
     for (int bad : {-1, n, n + 7}) {
@@ -121,13 +119,9 @@ TEST(Selection, ControlPointsFollowTheSelectedNode) {
     Bytes b = path.nodes;
     const int n = path.n();
     CRV_DisableAllNodes(b.data(), n);
-    for (int i = 0; i < n; ++i) {
-      if (IsArc(b[i])) {
-        ASSERT_FALSE(IsUserNode(b[i]) || IsEnabledNode(b[i]));
-      } else {
-        ASSERT_EQ(IsUserNode(b[i]), IsUserNode(path.nodes[i])) << k;  // only arcs lose the user bit
-      }
-    }
+    for (int i = 0; i < n; ++i)  // only arcs lose the user bit, and none stays selected
+      ASSERT_TRUE(IsArc(b[i]) ? !(IsUserNode(b[i]) || IsEnabledNode(b[i]))
+                              : IsUserNode(b[i]) == IsUserNode(path.nodes[i])) << k;
     // Pick user nodes; the last one picked is checked.
     const int picks = 1 + int(rng() % 2);
     int i = -1;
@@ -141,11 +135,8 @@ TEST(Selection, ControlPointsFollowTheSelectedNode) {
     EXPECT_EQ(count, CRV_HowManyEnabled(b.data(), n)) << k;
     for (int arc : ArcsAt(path, i)) EXPECT_TRUE(IsEnabledNode(b[arc])) << k << " arc " << arc << " of " << i;
     // One selected node offers its control points, several do not.
-    for (int j = 0; j < n; ++j) {
-      if (IsArc(b[j])) {
-        EXPECT_EQ(IsUserNode(b[j]), count == 1 && IsEnabledNode(b[j])) << k;
-      }
-    }
+    for (int j = 0; j < n; ++j)
+      EXPECT_TRUE(!IsArc(b[j]) || IsUserNode(b[j]) == (count == 1 && IsEnabledNode(b[j]))) << k;
   }
   // A selected line end, then a smooth line, then a Bezier: its arcs follow.
   Bytes s = {0x04, 0x45, 0x54, 0xC0, 0xC0, 0x84};

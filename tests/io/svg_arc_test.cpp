@@ -158,6 +158,12 @@ TEST(SvgArc, ToleranceAddsPieces) {
   EXPECT_GT(many, 50);
 }
 
+// Two lists of points agree within 1e-12.
+void ExpectClose(const std::vector<V>& a, const std::vector<V>& b) {
+  ASSERT_EQ(a.size(), b.size());
+  for (std::size_t i = 0; i < a.size(); ++i) EXPECT_LT(MavikMath::Distance(a[i], b[i]), 1e-12) << i;
+}
+
 TEST(SvgArc, RadiusCorrectionMakesAHalfEllipse) {
   // Radii 1 cannot span a chord of 10: they grow to 5 and the centre is the
   // chord's midpoint. Sweep 1 runs towards positive angles, through (5, -5)
@@ -165,19 +171,13 @@ TEST(SvgArc, RadiusCorrectionMakesAHalfEllipse) {
   std::vector<double> spans;
   CheckArc({0, 0}, 1, 1, 0, false, true, {10, 0}, 0.0, &spans);
   ASSERT_EQ(spans.size(), 2u);
-  std::vector<V> ctrl;
+  std::vector<V> ctrl, other;
   ASSERT_EQ(OstraCrv::SvgArcToCubics({0, 0}, 1, 1, 0, false, true, {10, 0}, 0.0, ctrl), 2);
-  EXPECT_NEAR(ctrl[2].x, 5, 1e-12);
-  EXPECT_NEAR(ctrl[2].y, -5, 1e-12);
+  EXPECT_LT(MavikMath::Distance(ctrl[2], V{5, -5}), 1e-12);
   // Both flags change nothing when the radii had to grow: the half ellipse is
   // the only arc, on the side the sweep picks.
-  std::vector<V> other;
   OstraCrv::SvgArcToCubics({0, 0}, 1, 1, 0, true, true, {10, 0}, 0.0, other);
-  ASSERT_EQ(other.size(), ctrl.size());
-  for (std::size_t i = 0; i < ctrl.size(); ++i) {
-    EXPECT_NEAR(other[i].x, ctrl[i].x, 1e-12);
-    EXPECT_NEAR(other[i].y, ctrl[i].y, 1e-12);
-  }
+  ExpectClose(other, ctrl);
   // A tilted ellipse with non-uniform radii, also corrected.
   CheckArc({3, 4}, 2, 0.5, 37, true, false, {-20, 11}, 0.0);
 }
@@ -202,12 +202,12 @@ TEST(SvgArc, FlagsPickOneOfFourArcs) {
 }
 
 TEST(SvgArc, DegenerateArcs) {
+  // Equal ends: nothing; a zero or non-finite radius or angle: failure.
+  const struct { double x2, rx, ry, phi; int want; } bad[] = {
+      {1, 5, 5, 0, 0}, {4, 0, 5, 0, -1}, {4, 5, 0, 0, -1}, {4, NAN, 5, 0, -1}, {4, 5, 5, INFINITY, -1}};
   std::vector<V> ctrl;
-  EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, 5, 5, 0, false, true, {1, 1}, 0.0, ctrl), 0);
-  EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, 0, 5, 0, false, true, {4, 1}, 0.0, ctrl), -1);
-  EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, 5, 0, 0, false, true, {4, 1}, 0.0, ctrl), -1);
-  EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, NAN, 5, 0, false, true, {4, 1}, 0.0, ctrl), -1);
-  EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, 5, 5, INFINITY, false, true, {4, 1}, 0.0, ctrl), -1);
+  for (const auto& b : bad)
+    EXPECT_EQ(OstraCrv::SvgArcToCubics({1, 1}, b.rx, b.ry, b.phi, false, true, {b.x2, 1}, 0.0, ctrl), b.want);
   EXPECT_TRUE(ctrl.empty());
   // In path data: zero radii draw a line, equal end points draw nothing.
   PolycurveD c;
@@ -220,24 +220,20 @@ TEST(SvgArc, DegenerateArcs) {
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A-3 4 10 0 1 5 5", a));
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A3 -4 10 0 1 5 5", b));
   EXPECT_EQ(a, b);
-  // Huge radii on a small chord: nearly straight, finite, ends exact.
-  ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A1e300 1e300 0 0 1 1 0", a));
-  for (const V& p : a.Points()) EXPECT_TRUE(p.IsFinite());
-  EXPECT_EQ(a.GetLastPoint(), (V{1, 0}));
-  // Tiny radii on a huge chord are scaled up.
-  ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A1e-300 1e-300 0 0 1 1e300 0", a));
-  for (const V& p : a.Points()) EXPECT_TRUE(p.IsFinite());
+  // Huge radii on a small chord are nearly straight; tiny radii on a huge
+  // chord are scaled up: finite either way, ends exact.
+  for (const char* d : {"M0 0 A1e300 1e300 0 0 1 1 0", "M0 0 A1e-300 1e-300 0 0 1 1e300 0"}) {
+    ASSERT_TRUE(OstraCrv::ParseSvgPathData(d, a));
+    for (const V& p : a.Points()) EXPECT_TRUE(p.IsFinite()) << d;
+    EXPECT_EQ(a.GetLastPoint().y, 0.0) << d;
+  }
 }
 
 TEST(SvgArc, RotationIsTakenModuloAFullTurn) {
   PolycurveD a, b;
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A8 3 30 1 0 5 7", a));
   ASSERT_TRUE(OstraCrv::ParseSvgPathData("M0 0 A8 3 390 1 0 5 7", b));
-  ASSERT_EQ(a.GetPointCount(), b.GetPointCount());
-  for (int i = 0; i < int(a.GetPointCount()); ++i) {
-    EXPECT_NEAR(a.GetPoint(i).x, b.GetPoint(i).x, 1e-12);
-    EXPECT_NEAR(a.GetPoint(i).y, b.GetPoint(i).y, 1e-12);
-  }
+  ExpectClose({a.GetPoints(), a.GetPoints() + a.GetPointCount()}, {b.GetPoints(), b.GetPoints() + b.GetPointCount()});
 }
 
 }  // namespace

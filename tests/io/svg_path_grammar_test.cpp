@@ -37,9 +37,7 @@ void ExpectNodes(std::string_view d, const std::vector<Node>& want) {
   const auto got = Nodes(c);
   ASSERT_EQ(got.size(), want.size()) << d;
   for (std::size_t i = 0; i < want.size(); ++i) {
-    EXPECT_EQ(int(got[i].type), int(want[i].type)) << d << " node " << i;
-    EXPECT_EQ(got[i].p.x, want[i].p.x) << d << " node " << i;
-    EXPECT_EQ(got[i].p.y, want[i].p.y) << d << " node " << i;
+    EXPECT_TRUE(got[i].type == want[i].type && got[i].p == want[i].p) << d << " node " << i;
   }
   EXPECT_TRUE(OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount())) << d;
 }
@@ -48,73 +46,63 @@ const NODETYPE kMove = NodeTypes::Open::move, kLine = NodeTypes::Open::line, kCu
                kArc = NodeTypes::arc, kCMove = NodeTypes::Closed::move, kCLine = NodeTypes::Closed::line,
                kCCurve = NodeTypes::Closed::curve;
 
-TEST(SvgPathGrammar, EmptyAndBlankTextsAreEmptyCurves) {
-  EXPECT_TRUE(Parse("").IsEmpty());
-  EXPECT_TRUE(Parse(" \t\r\n\f").IsEmpty());
-}
+struct NodeCase {
+  const char* d;
+  std::vector<Node> want;
+};
 
-TEST(SvgPathGrammar, NumberForms) {
-  ExpectNodes("M1.5.5", {{kMove, {1.5, 0.5}}});
-  ExpectNodes("M1e2-3", {{kMove, {100, -3}}});
-  ExpectNodes("M.5-.5e1", {{kMove, {0.5, -5}}});
-  ExpectNodes("M+1E+2,-1e-2", {{kMove, {100, -0.01}}});
-  ExpectNodes("M1.-2.", {{kMove, {1, -2}}});
-  ExpectNodes("M0.1e1.5", {{kMove, {1, 0.5}}});
-  ExpectNodes("M1e2.5", {{kMove, {100, 0.5}}});
-  // Exact decimal conversion: the nearest double, as a C library reads it.
-  ExpectNodes("M0.1 123456789.123456789", {{kMove, {0.1, 123456789.123456789}}});
+TEST(SvgPathGrammar, CommandsMapOntoNodes) {
+  const NodeCase cases[] = {
+      // Number forms; decimal conversion gives the nearest double, as a C
+      // library reads it.
+      {"M1.5.5", {{kMove, {1.5, 0.5}}}},
+      {"M1e2-3", {{kMove, {100, -3}}}},
+      {"M.5-.5e1", {{kMove, {0.5, -5}}}},
+      {"M+1E+2,-1e-2", {{kMove, {100, -0.01}}}},
+      {"M1.-2.", {{kMove, {1, -2}}}},
+      {"M0.1e1.5", {{kMove, {1, 0.5}}}},
+      {"M1e2.5", {{kMove, {100, 0.5}}}},
+      {"M0.1 123456789.123456789", {{kMove, {0.1, 123456789.123456789}}}},
+      // Moves, lines and implicit repetition.
+      {"M1,2 3,4", {{kMove, {1, 2}}, {kLine, {3, 4}}}},
+      {"m1 2 3 4", {{kMove, {1, 2}}, {kLine, {4, 6}}}},
+      {"M1 2 l3 4 5 6", {{kMove, {1, 2}}, {kLine, {4, 6}}, {kLine, {9, 12}}}},
+      {"M0 0L1 1,2 2", {{kMove, {0, 0}}, {kLine, {1, 1}}, {kLine, {2, 2}}}},
+      {"M0 0 H5 V5 h-5 v-5 H1 2",
+       {{kMove, {0, 0}}, {kLine, {5, 0}}, {kLine, {5, 5}}, {kLine, {0, 5}}, {kLine, {0, 0}}, {kLine, {1, 0}},
+        {kLine, {2, 0}}}},
+      // A move after a move leaves a dangling move; a later relative move is
+      // relative to the previous one.
+      {"M1 1 M2 2 m1 1", {{kMove, {1, 1}}, {kMove, {2, 2}}, {kMove, {3, 3}}}},
+      // Close stores the closing point twice; a last segment that already ends
+      // on the start is the closing segment; a lone move can close; Z Z is one Z.
+      {"M0 0 L10 0 L10 10 Z", {{kCMove, {0, 0}}, {kLine, {10, 0}}, {kLine, {10, 10}}, {kCLine, {0, 0}}}},
+      {"M0 0 L10 0 L0 0 z", {{kCMove, {0, 0}}, {kLine, {10, 0}}, {kCLine, {0, 0}}}},
+      {"M0 0 C1 1 2 1 0 0 Z", {{kCMove, {0, 0}}, {kArc, {1, 1}}, {kArc, {2, 1}}, {kCCurve, {0, 0}}}},
+      {"M5 5 Z", {{kCMove, {5, 5}}}},
+      {"M0 0 L1 0 Z Z", {{kCMove, {0, 0}}, {kLine, {1, 0}}, {kCLine, {0, 0}}}},
+      // After a close the next subpath starts at the closed point.
+      {"M1 1 L10 1 L10 10 Z l 5 5",
+       {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kLine, {10, 10}}, {kCLine, {1, 1}}, {kMove, {1, 1}}, {kLine, {6, 6}}}},
+      {"M1 1 L10 1 z m 1 1 h2",
+       {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kCLine, {1, 1}}, {kMove, {2, 2}}, {kLine, {4, 2}}}},
+      {"M1 1 L10 1 Z C1 2 3 4 5 6",
+       {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kCLine, {1, 1}}, {kMove, {1, 1}}, {kArc, {1, 2}}, {kArc, {3, 4}},
+        {kCurve, {5, 6}}}},
+      // A smooth cubic reflects the control only after a cubic; after a line
+      // the first control is the current point.
+      {"M0 0 C1 1 2 1 3 0 S5 -1 6 0 s1 1 2 0",
+       {{kMove, {0, 0}}, {kArc, {1, 1}}, {kArc, {2, 1}}, {kCurve, {3, 0}}, {kArc, {4, -1}}, {kArc, {5, -1}},
+        {kCurve, {6, 0}}, {kArc, {7, 1}}, {kArc, {7, 1}}, {kCurve, {8, 0}}}},
+      {"M0 0 L3 0 S5 -1 6 0", {{kMove, {0, 0}}, {kLine, {3, 0}}, {kArc, {3, 0}}, {kArc, {5, -1}}, {kCurve, {6, 0}}}},
+  };
+  for (const auto& k : cases) ExpectNodes(k.d, k.want);
+  EXPECT_EQ(Parse("M0 0 Q3 3 6 0 S8 1 9 0").GetPoint(4), (V{6, 0}));  // after a quadratic too
   // Underflow reads as zero with its sign; the sign of zero is kept.
   const PolycurveD c = Parse("M1e-400-0");
   EXPECT_EQ(c.GetPoint(0).x, 0.0);
   EXPECT_TRUE(std::signbit(c.GetPoint(0).y));
   EXPECT_FALSE(std::signbit(c.GetPoint(0).x));
-}
-
-TEST(SvgPathGrammar, MovesLinesAndImplicitRepetition) {
-  ExpectNodes("M1,2 3,4", {{kMove, {1, 2}}, {kLine, {3, 4}}});
-  ExpectNodes("m1 2 3 4", {{kMove, {1, 2}}, {kLine, {4, 6}}});
-  ExpectNodes("M1 2 l3 4 5 6", {{kMove, {1, 2}}, {kLine, {4, 6}}, {kLine, {9, 12}}});
-  ExpectNodes("M0 0L1 1,2 2", {{kMove, {0, 0}}, {kLine, {1, 1}}, {kLine, {2, 2}}});
-  ExpectNodes("M0 0 H5 V5 h-5 v-5 H1 2",
-              {{kMove, {0, 0}}, {kLine, {5, 0}}, {kLine, {5, 5}}, {kLine, {0, 5}}, {kLine, {0, 0}}, {kLine, {1, 0}},
-               {kLine, {2, 0}}});
-  // A move after a move leaves a dangling move; a later relative move is
-  // relative to the previous one.
-  ExpectNodes("M1 1 M2 2 m1 1", {{kMove, {1, 1}}, {kMove, {2, 2}}, {kMove, {3, 3}}});
-}
-
-TEST(SvgPathGrammar, CloseStoresTheClosingPointTwice) {
-  ExpectNodes("M0 0 L10 0 L10 10 Z",
-              {{kCMove, {0, 0}}, {kLine, {10, 0}}, {kLine, {10, 10}}, {kCLine, {0, 0}}});
-  // A last segment that already ends on the start is the closing segment.
-  ExpectNodes("M0 0 L10 0 L0 0 z", {{kCMove, {0, 0}}, {kLine, {10, 0}}, {kCLine, {0, 0}}});
-  ExpectNodes("M0 0 C1 1 2 1 0 0 Z", {{kCMove, {0, 0}}, {kArc, {1, 1}}, {kArc, {2, 1}}, {kCCurve, {0, 0}}});
-  // A lone move closed.
-  ExpectNodes("M5 5 Z", {{kCMove, {5, 5}}});
-  // Z Z is one Z.
-  ExpectNodes("M0 0 L1 0 Z Z", {{kCMove, {0, 0}}, {kLine, {1, 0}}, {kCLine, {0, 0}}});
-}
-
-TEST(SvgPathGrammar, AfterCloseTheNextSubpathStartsAtTheClosedPoint) {
-  ExpectNodes("M1 1 L10 1 L10 10 Z l 5 5",
-              {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kLine, {10, 10}}, {kCLine, {1, 1}}, {kMove, {1, 1}},
-               {kLine, {6, 6}}});
-  ExpectNodes("M1 1 L10 1 z m 1 1 h2",
-              {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kCLine, {1, 1}}, {kMove, {2, 2}}, {kLine, {4, 2}}});
-  ExpectNodes("M1 1 L10 1 Z C1 2 3 4 5 6",
-              {{kCMove, {1, 1}}, {kLine, {10, 1}}, {kCLine, {1, 1}}, {kMove, {1, 1}}, {kArc, {1, 2}},
-               {kArc, {3, 4}}, {kCurve, {5, 6}}});
-}
-
-TEST(SvgPathGrammar, SmoothCubicReflectsOnlyAfterACubic) {
-  ExpectNodes("M0 0 C1 1 2 1 3 0 S5 -1 6 0 s1 1 2 0",
-              {{kMove, {0, 0}}, {kArc, {1, 1}}, {kArc, {2, 1}}, {kCurve, {3, 0}}, {kArc, {4, -1}}, {kArc, {5, -1}},
-               {kCurve, {6, 0}}, {kArc, {7, 1}}, {kArc, {7, 1}}, {kCurve, {8, 0}}});
-  // After a line, and after a quadratic, the first control is the current
-  // point.
-  ExpectNodes("M0 0 L3 0 S5 -1 6 0", {{kMove, {0, 0}}, {kLine, {3, 0}}, {kArc, {3, 0}}, {kArc, {5, -1}}, {kCurve, {6, 0}}});
-  const PolycurveD c = Parse("M0 0 Q3 3 6 0 S8 1 9 0");
-  EXPECT_EQ(c.GetPoint(4), (V{6, 0}));
 }
 
 // The point of a quadratic at t.
@@ -199,7 +187,10 @@ TEST(SvgPathGrammar, ErrorsGivePositionReasonAndThePathUpToThem) {
     EXPECT_EQ(int(c.GetPointCount()), k.nodesKept) << k.d;
     EXPECT_TRUE(OstraCrv::IsValidCurve(c.GetNodeTypes(), c.GetPointCount())) << k.d;
   }
-  // Without an error record the result is still reported.
+  // Without an error record the result is still reported; empty and blank
+  // texts are empty curves.
+  EXPECT_TRUE(Parse("").IsEmpty());
+  EXPECT_TRUE(Parse(" \t\r\n\f").IsEmpty());
   PolycurveD c;
   EXPECT_FALSE(OstraCrv::ParseSvgPathData("M1", c));
   OstraCrv::SvgPathError e{5, "x"};
